@@ -1,0 +1,23 @@
+# What `cmake --install` gives: headers, the library, a CMake package and a pkg-config file.
+include(CMakePackageConfigHelpers)
+
+set(TESSELLA_PACKAGE_DIR ${CMAKE_INSTALL_LIBDIR}/cmake/tessella)
+
+install(TARGETS tessella EXPORT tessellaTargets
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+install(FILES include/tessella.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
+install(DIRECTORY include/tessella DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} FILES_MATCHING PATTERN "*.h")
+
+install(EXPORT tessellaTargets NAMESPACE tessella:: DESTINATION ${TESSELLA_PACKAGE_DIR})
+configure_package_config_file(cmake/tessellaConfig.cmake.in ${PROJECT_BINARY_DIR}/tessellaConfig.cmake
+    INSTALL_DESTINATION ${TESSELLA_PACKAGE_DIR})
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/tessellaConfigVersion.cmake
+    COMPATIBILITY SameMajorVersion)
+install(FILES ${PROJECT_BINARY_DIR}/tessellaConfig.cmake ${PROJECT_BINARY_DIR}/tessellaConfigVersion.cmake
+    DESTINATION ${TESSELLA_PACKAGE_DIR})
+
+# The folders from the .pc file's own, so that a tree installed with another prefix, or moved, still works.
+file(RELATIVE_PATH TESSELLA_PC_TO_PREFIX
+    ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+configure_file(cmake/tessella.pc.in ${PROJECT_BINARY_DIR}/tessella.pc @ONLY)
+install(FILES ${PROJECT_BINARY_DIR}/tessella.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig)

@@ -1,0 +1,74 @@
+#include <console/framebuffer_model.h>
+
+#include <cerrno>
+#include <cstring>
+
+namespace console {
+
+namespace {
+
+constexpr unsigned long kPhysicalAddress = 0xFD000000;  // nothing maps it; where adapters tend to lie
+
+fb_bitfield BitField(ColourField field) { return {field.offset, field.length, 0}; }
+
+}
+
+std::size_t FramebufferModel::MemoryLength(DisplayMode const& mode)
+{
+    return std::size_t{2} * mode.pitch * mode.height;
+}
+
+fb_fix_screeninfo FramebufferModel::FixedInfo() const
+{
+    fb_fix_screeninfo info{};
+    std::strcpy(info.id, "VESA VGA");
+    info.smem_start = kPhysicalAddress;
+    info.smem_len = static_cast<unsigned>(MemoryLength(state.mode));
+    info.type = FB_TYPE_PACKED_PIXELS;
+    info.visual = state.format.bits <= 8 ? FB_VISUAL_PSEUDOCOLOR : FB_VISUAL_TRUECOLOR;
+    info.line_length = state.mode.pitch;
+    info.accel = FB_ACCEL_NONE;
+    return info;
+}
+
+fb_var_screeninfo FramebufferModel::VariableInfo() const
+{
+    fb_var_screeninfo info{};
+    info.xres = info.xres_virtual = state.mode.width;
+    info.yres = info.yres_virtual = state.mode.height;
+    info.bits_per_pixel = state.format.bits;
+    info.red = BitField(state.format.red);
+    info.green = BitField(state.format.green);
+    info.blue = BitField(state.format.blue);
+    info.transp = BitField(state.format.transparency);
+    info.activate = FB_ACTIVATE_NOW;
+    info.height = info.width = ~0U;  // in millimetres: unknown
+    info.vmode = FB_VMODE_NONINTERLACED;
+    return info;
+}
+
+int FramebufferModel::PutColourMap(fb_cmap const& map)
+{
+    auto& own = state.colourMap;
+    if (map.start >= own.red.size() || map.len > own.red.size() - map.start) return EINVAL;
+    if (map.red == nullptr || map.green == nullptr || map.blue == nullptr) return EFAULT;
+    for (unsigned i = 0; i < map.len; ++i) {
+        own.red[map.start + i] = map.red[i];
+        own.green[map.start + i] = map.green[i];
+        own.blue[map.start + i] = map.blue[i];
+    }
+    return 0;
+}
+
+int FramebufferModel::Answer(Request request, void* argument)
+{
+    if (argument == nullptr) return EFAULT;
+    switch (request) {
+    case Request::GetFixedInfo: *static_cast<fb_fix_screeninfo*>(argument) = FixedInfo(); return 0;
+    case Request::GetVariableInfo: *static_cast<fb_var_screeninfo*>(argument) = VariableInfo(); return 0;
+    case Request::PutColourMap: return PutColourMap(*static_cast<fb_cmap const*>(argument));
+    default: return ENOTTY;
+    }
+}
+
+}

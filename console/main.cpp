@@ -1,0 +1,82 @@
+// tessella-console: runs a program on a virtual console.
+
+#include <console/options.h>
+#include <console/picture.h>
+#include <console/run_program.h>
+
+#include <cstdio>
+#include <filesystem>
+#include <system_error>
+
+namespace {
+
+constexpr int kConsoleFailed = 2;
+constexpr int kProgramFailed = 127;
+
+int Complain(std::string const& problem, int status)
+{
+    std::fprintf(stderr, "tessella-console: %s\n", problem.c_str());
+    return status;
+}
+
+/// The preloaded object lies beside the tool in the build folder, and where the installation puts it otherwise.
+/// Empty if it is in neither place.
+std::string FindPreloaded()
+{
+    std::error_code error;
+    auto const folder = std::filesystem::read_symlink("/proc/self/exe", error).parent_path();
+    for (char const* const relative : {TESSELLA_CONSOLE_OBJECT, TESSELLA_CONSOLE_INSTALLED_OBJECT}) {
+        auto const path = (folder / relative).lexically_normal();
+        if (std::filesystem::exists(path, error)) return path.string();
+    }
+    return {};
+}
+
+int Run(console::Options const& options, std::string const& preloaded)
+{
+    console::VirtualConsole virtualConsole(options.setup);
+    int status = 0;
+    try {
+        status = console::RunProgram(virtualConsole, preloaded, options.program);
+    } catch (std::system_error const& error) {
+        return Complain(std::string("cannot run ") + error.what(), kProgramFailed);
+    }
+    if (!options.screenshot.empty()) {
+        auto const problem = console::SavePicture(virtualConsole.Screen(), options.screenshot);
+        if (!problem.empty())
+            return Complain("cannot write " + options.screenshot + ": " + problem, kConsoleFailed);
+    }
+    return status;
+}
+
+int Follow(std::span<char*> words)
+{
+    auto const read = console::ReadOptions(words);
+    if (auto const* const problem = std::get_if<std::string>(&read))
+        return Complain(*problem + " (--help tells more)", kConsoleFailed);
+    auto const& options = std::get<console::Options>(read);
+    if (options.help) {
+        std::fputs(console::kHelp, stdout);
+        return 0;
+    }
+    auto const preloaded = FindPreloaded();
+    if (preloaded.empty())
+        return Complain("its preloaded object " TESSELLA_CONSOLE_OBJECT " is missing", kConsoleFailed);
+    // The loader divides its list there.
+    if (preloaded.find_first_of(" :") != std::string::npos)
+        return Complain(
+            "it cannot work from " + preloaded + ", a path with blanks or colons", kConsoleFailed);
+    return Run(options, preloaded);
+}
+
+}
+
+int main(int count, char** words)
+{
+    try {
+        return Follow({words + 1, static_cast<std::size_t>(count - 1)});
+    } catch (std::exception const& error) {
+        std::fprintf(stderr, "tessella-console: failed: %s\n", error.what());
+        return kConsoleFailed;
+    }
+}

@@ -1,0 +1,24 @@
+#pragma once
+
+#include <console/virtual_console.h>
+
+#include <span>
+#include <string>
+#include <variant>
+
+namespace console {
+
+/// A command line of the tool, read.
+struct Options {
+    Setup setup;
+    std::string screenshot;    ///< a file's path, empty for none
+    bool help = false;         ///< nothing else counts then
+    std::span<char*> program;  ///< with its arguments; part of the command line
+};
+
+extern char const* const kHelp;
+
+/// Reads the words after the tool's name. Gives what is wrong, in one sentence, if they cannot be followed.
+std::variant<Options, std::string> ReadOptions(std::span<char*> words);
+
+}

@@ -1,0 +1,79 @@
+#include <console/picture.h>
+
+#include <console/colour_map.h>
+
+#include <png.h>
+
+namespace console {
+
+namespace {
+
+struct Shown {
+    std::uint8_t red, green, blue;
+};
+
+/// The bytes of a pixel as a number; the lowest come first.
+std::uint32_t ReadPixel(unsigned char const* bytes, unsigned count)
+{
+    std::uint32_t pixel = 0;
+    for (unsigned i = 0; i < count; ++i)
+        pixel |= std::uint32_t{bytes[i]} << (8 * i);
+    return pixel;
+}
+
+Shown ShowIndex(ColourMap const& colours, std::uint32_t index)
+{
+    return {ShownByConverter(colours.red[index]), ShownByConverter(colours.green[index]),
+        ShownByConverter(colours.blue[index])};
+}
+
+std::uint8_t ShowField(std::uint32_t pixel, ColourField field, unsigned depth)
+{
+    return ShownField(pixel >> field.offset & ((1U << field.length) - 1), field.length, depth);
+}
+
+Shown ShowPacked(PixelFormat const& format, unsigned depth, std::uint32_t pixel)
+{
+    return {ShowField(pixel, format.red, depth), ShowField(pixel, format.green, depth),
+        ShowField(pixel, format.blue, depth)};
+}
+
+}
+
+std::uint32_t Picture::At(unsigned x, unsigned y) const
+{
+    auto const* const pixel = &bytes.at((std::size_t{y} * width + x) * 3);
+    return std::uint32_t{pixel[0]} << 16 | std::uint32_t{pixel[1]} << 8 | pixel[2];
+}
+
+Picture TakePicture(DisplayMode const& mode, ColourMap const& colours, std::span<unsigned char const> memory)
+{
+    Picture picture{mode.width, mode.height, {}};
+    picture.bytes.reserve(std::size_t{mode.width} * mode.height * 3);
+    auto const format = FormatOf(mode.depth);
+    unsigned const step = BytesPerPixel(mode.depth);
+    for (unsigned y = 0; y < mode.height; ++y) {
+        auto const row = memory.subspan(std::size_t{y} * mode.pitch, std::size_t{mode.width} * step);
+        for (std::size_t at = 0; at < row.size(); at += step) {
+            auto const pixel = ReadPixel(&row[at], step);
+            auto const shown =
+                mode.depth == 8 ? ShowIndex(colours, pixel) : ShowPacked(format, mode.depth, pixel);
+            picture.bytes.insert(picture.bytes.end(), {shown.red, shown.green, shown.blue});
+        }
+    }
+    return picture;
+}
+
+std::string SavePicture(Picture const& picture, std::string const& path)
+{
+    png_image image{};
+    image.version = PNG_IMAGE_VERSION;
+    image.width = picture.width;
+    image.height = picture.height;
+    image.format = PNG_FORMAT_RGB;
+    image.flags = PNG_IMAGE_FLAG_FAST;
+    if (png_image_write_to_file(&image, path.c_str(), 0, picture.bytes.data(), 0, nullptr) != 0) return {};
+    return image.message;
+}
+
+}

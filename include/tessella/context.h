@@ -1,0 +1,84 @@
+#pragma once
+
+#include <tessella/color.h>
+#include <tessella/export.h>
+#include <tessella/region.h>
+#include <tessella/types.h>
+
+#include <cstdint>
+
+/// The raster mode that paints in the fore and back colours; every other value inverts the pixels.
+enum : std::uint32_t { GrRasterModeCopy = 4 };
+
+/// The one drawing interface, over the screen as well as over images in memory.
+///
+/// A context has a clip region, an origin, two colours, an 8 by 8 pattern and a raster mode. All operations
+/// take context coordinates; the surface coordinate of a point is its context coordinate plus the origin.
+/// Nothing is ever painted outside the clip region, and drawing reports nothing: where the clip is empty,
+/// nothing happens. A context does not own the pixels that it draws on, which must outlive it.
+///
+/// A context is used by one thread at a time. Contexts of the screen serialise their access to it with the
+/// input threads by themselves.
+///
+/// The operations are declared in the order of their table, which is part of the library's interface.
+class GR_API GrContext {
+public:
+    GrContext() = default;
+    GrContext(GrContext const&) = delete;
+    GrContext& operator=(GrContext const&) = delete;
+    virtual ~GrContext() = default;
+
+    /// Restricts drawing to `region` (context coordinates, as the origin is now), within the context's limit.
+    /// The clip lies on the surface: a later `SetOrigin` does not move it.
+    virtual void SetClipRegion(GrRegion const& region) = 0;
+    /// Writes the clip region, in context coordinates, into `region`.
+    virtual void GetClipRegion(GrRegion& region) = 0;
+    /// Takes a rectangle away from the clip.
+    virtual void ExcludeClipRect(GrRect const& rect) = 0;
+    /// Takes a region away from the clip.
+    virtual void ExcludeClipRegion(GrRegion const& region) = 0;
+    /// Makes the clip as large as the context's limit again.
+    virtual void ResetClipRegion() = 0;
+    /// Writes the smallest rectangle around the clip, in context coordinates, into `rect`.
+    virtual void GetClipRect(GrRect& rect) = 0;
+
+    /// Puts context point (0, 0) at `x`, `y` from the context's base origin.
+    virtual void SetOrigin(int x, int y) = 0;
+    /// Where context point (0, 0) lies, from the context's base origin.
+    virtual void GetOrigin(int& x, int& y) = 0;
+
+    /// Chooses the colour of clear pattern bits, converted to a pixel value once, here.
+    virtual void SetBackColor(GrColor color) = 0;
+    /// Chooses the colour of set pattern bits, converted to a pixel value once, here.
+    virtual void SetForeColor(GrColor color) = 0;
+
+    /// Chooses the pattern, copied from eight bytes, one a row, bit 0 being the leftmost pixel. It is anchored
+    /// to the surface, not to the origin, and moved by `dx` to the right and `dy` downward. A clear bit paints
+    /// the back colour, or nothing if `transparent` is set. A new context's pattern is all ones.
+    virtual void SetPattern(std::uint8_t const bits[8], int dx, int dy, bool transparent) = 0;
+
+    /// `GrRasterModeCopy`, or any other value to invert pixels.
+    virtual void SetRasterMode(std::uint32_t mode) = 0;
+    /// The value last set; `GrRasterModeCopy` in a new context.
+    virtual std::uint32_t GetRasterMode() = 0;
+
+    /// The colour of one pixel; 0 outside the clip.
+    virtual GrColor GetPixel(int x, int y) = 0;
+    /// Paints one pixel through pattern and raster mode.
+    virtual void DrawPixel(int x, int y) = 0;
+    /// Paints a region through pattern and raster mode.
+    virtual void FillRegion(GrRegion const& region) = 0;
+
+    /// Copies the rectangle `dst` from `source`, whose point `sx`, `sy` goes to its top left corner. Contexts
+    /// that cannot do so do nothing.
+    virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);
+};
+
+/// What contexts over images offer beyond `GrContext`.
+class GR_API GrContextI : public GrContext {
+public:
+    /// Puts both the base origin and the origin at surface point `x`, `y`.
+    virtual void SetBaseOrigin(int x, int y) = 0;
+    /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it.
+    virtual void SetLimitRegion(GrRegion const& region) = 0;
+};

@@ -1,0 +1,53 @@
+#pragma once
+
+#include <tessella/context.h>
+#include <tessella/export.h>
+
+#include <cstdint>
+
+/// Flags of a `GrImage`.
+enum : std::uint32_t {
+    GrImageNoDither = 4,            ///< do not diffuse errors when converting; changeable with `SetFlags`
+    GrImageHasAlpha = 8,            ///< there is an alpha plane; implies `GrImageTrueColor`
+    GrImageOverBack = 16,           ///< blend over the context's back colour; changeable with `SetFlags`
+    GrImageAlphaOnly = 32,          ///< with `GrImageHasAlpha`: the image has no `pixels`
+    GrImageTrueColor = 0x10000,     ///< 4 bytes a pixel, the pixel being a `GrColor`
+    GrImagePremultiplied = 0x20000  ///< true-colour pixels are premultiplied by their alpha
+};
+
+/// A picture in memory, in some pixel format, with an optional plane of alpha values.
+///
+/// An image has no lock: one thread at a time uses it and its contexts.
+class GR_API GrImage {
+public:
+    std::int32_t width;         ///< in pixels
+    std::int32_t height;        ///< in pixels
+    std::int32_t bits;          ///< the format's depth: 4, 8, 15, 16, 24 or 32
+    std::int32_t bytes;         ///< bytes a pixel
+    std::uint32_t flags;        ///< `GrImageNoDither` and the others
+    unsigned char* pixels;      ///< rows from the top, without padding between them; owned; may be null
+    unsigned char* alphaPlane;  ///< one byte a pixel; owned; may be null
+
+    /// An image of black pixels in the screen's format, or in true colour if `flags` say so. The alpha plane,
+    /// if asked for, is not initialised. Without a positive width and height there is neither.
+    GrImage(int width, int height, std::uint32_t flags);
+
+    /// An image around pixels and alpha values allocated with `new[]`, either of which may be null; the image
+    /// owns them from now on. Meant for true colour (`bits` 32, `bytes` 4): without `GrImageTrueColor` or
+    /// `GrImageHasAlpha` in `flags`, `bits` and `bytes` are uninitialised and the caller assigns them.
+    GrImage(int width, int height, unsigned char* pixels, unsigned char* alphaPlane, std::uint32_t flags);
+
+    GrImage(GrImage const&) = delete;
+    GrImage& operator=(GrImage const&) = delete;
+    ~GrImage();
+
+    /// Lets go of pixels and alpha plane without releasing them.
+    void Detach();
+
+    /// A new context over the image, in its format, with the image's size as its limit. The caller deletes it,
+    /// before the image. Null for `bits` that no format has, after a failed assertion.
+    GrContext* GetContext() const;
+
+    /// Changes `GrImageNoDither` and `GrImageOverBack` to what `flags` say, and nothing else.
+    void SetFlags(std::uint32_t flags);
+};

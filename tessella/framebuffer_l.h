@@ -1,0 +1,13 @@
+#pragma once
+
+/// Opens the first framebuffer device there is, unless one is open already. False if there is none.
+bool OpenFramebuffer();
+
+/// Learns the mode that the framebuffer's driver has, maps its memory and fills `GrScreen`. The driver's mode
+/// is never changed; in 8-bit modes its colour map is. The references receive size and depth, on success only;
+/// `mode` is ignored. On the application's thread.
+bool GrSetVideoMode(unsigned& width, unsigned& height, unsigned& depth, unsigned mode);
+
+/// Unmaps the framebuffer's memory and closes its device. `GrScreen` keeps the dead values: the library serves
+/// one session a process.
+void CloseFramebuffer();

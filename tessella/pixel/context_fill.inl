@@ -1,0 +1,51 @@
+template <typename S>
+void GrGenericContextBase<S>::GetClipRect(GrRect& rect)
+{
+    this->clip.GetOuterRect(rect);
+    rect.x1 -= this->originX;
+    rect.y1 -= this->originY;
+    rect.x2 -= this->originX;
+    rect.y2 -= this->originY;
+}
+
+template <typename S>
+void GrGenericContextBase<S>::DrawPixel(int x, int y)
+{
+    x += this->originX;
+    y += this->originY;
+    if (!this->clip.Contains(x, y)) return;
+    typename S::Guard const guard(GrRect{x, y, x + 1, y + 1});
+    if (!this->HasPixels()) return;
+    this->PatternPixel(
+        this->RowAddress(y), x, this->pattern[y & 7], this->patternTransparent, this->rasterMode);
+}
+
+template <typename S>
+void GrGenericContextBase<S>::FillRegion(GrRegion const& region)
+{
+    GrRegion local(region);
+    local.Offset(this->originX, this->originY);
+    local &= this->clip;
+    typename S::Guard const guard(local);
+    if (!this->HasPixels()) return;
+    for (auto const& band : BandsOf(local)) {
+        unsigned char* const top = this->RowAddress(band.r1);
+        for (auto const& range : RangesOf(band)) {
+            unsigned char* row = top;
+            for (int y = band.r1; y < band.r2; ++y, row += this->Stride())
+                this->PatternSpan(row, range.r1, range.r2 - range.r1, this->pattern[y & 7],
+                    this->patternTransparent, this->rasterMode);
+        }
+    }
+}
+
+template <typename S, GrColorsPolicy Colors>
+GrColor GrGenericContext<S, Colors>::GetPixel(int x, int y)
+{
+    x += this->originX;
+    y += this->originY;
+    if (!this->clip.Contains(x, y)) return 0;
+    typename S::Guard const guard(GrRect{x, y, x + 1, y + 1});
+    if (!this->HasPixels()) return 0;
+    return Colors::FromPixel(static_cast<Pixel>(S::ReadPixel(this->RowAddress(y), x)));
+}

@@ -1,0 +1,37 @@
+#pragma once
+
+#include <tessella/pixel/context_base.h>
+#include <tessella/screen.h>
+#include <tessella/screen_guard.h>
+
+#include <cstddef>
+
+/// The fields of a screen context. Surface coordinates are screen coordinates.
+struct GrScreenContextState : GrContext {
+    GrScreenContextState(GrRegion const& region, int x, int y)
+        : clip(region), limit(region), baseOriginX(x), baseOriginY(y), originX(x), originY(y)
+    {}
+
+protected:
+    GrRegion clip;
+    std::uint8_t pattern[8] = {0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF, 0xFF};
+    bool patternTransparent = false;
+    GrRegion limit;
+    std::int32_t baseOriginX, baseOriginY;
+    std::int32_t originX, originY;
+};
+
+/// Contexts over the mapped framebuffer. They hold no address: base and stride are read from `GrScreen` at each
+/// use, since the mapping may be made anew while a context lives.
+class GrScreenContextBase : public GrContextBase<GrScreenContextState> {
+protected:
+    using GrContextBase::GrContextBase;
+
+    /// Held around every access to pixels.
+    using Guard = GrScreenGuard;
+
+    /// False while there is no mapping, or the kernel refused it: nothing is painted then.
+    static bool HasPixels();
+    static unsigned char* PixelBase() { return GrScreen.fbMemory; }
+    static std::ptrdiff_t Stride() { return GrScreen.stride; }
+};

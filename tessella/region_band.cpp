@@ -1,0 +1,258 @@
+#include <tessella/region_storage.h>
+
+#include <memory>
+
+// The three merges of range lists share one shape. Where the other band begins and ends is searched for; the
+// ranges of this band in between, the window, are merged with the other's into a buffer; and what was made takes
+// the window's place, in this band or in a copy of it. Ranges outside the window are at most moved as a block.
+//
+//     band    ===  ===   ====  ==  ===       other      ==  =====  =
+//                  [   window   ]            made   ===  ========  ===
+//
+// Capacity. A list grows by 10 slots whenever a walk in place, writing behind its own reading, would have to
+// write more than it has read. The buffer makes that walk unnecessary, but not its arithmetic: each merge notes
+// the largest number of slots that the walk would need at any moment, and the capacity rises to it in tens.
+
+using Band = GrRegion::Band;
+
+namespace {
+
+/// Room for a merge's outcome: on the stack, unless it is large.
+class RangeBuffer {
+public:
+    explicit RangeBuffer(int capacity)
+    {
+        if (capacity > kFew) many = std::make_unique_for_overwrite<GrRange[]>(static_cast<std::size_t>(capacity));
+    }
+    GrRange* Items() { return many ? many.get() : few; }
+
+private:
+    static constexpr int kFew = 64;
+    GrRange few[kFew];
+    std::unique_ptr<GrRange[]> many;
+};
+
+/// The ranges `first` to `last` - 1 of `band`: all that `other` can touch. `other` has ranges.
+struct Window {
+    Window(Band const& band, Band const& other)
+        : first(FirstEndingAfter(band, other.items[0].r1)),
+          last(std::max(first, LastStartingBy(band, other.items[other.item_count - 1].r2 - 1) + 1)),
+          buffer(last - first + other.item_count)
+    {
+    }
+
+    int first, last;
+    RangeBuffer buffer;
+};
+
+/// `result` = `band` with the ranges `first` to `last` - 1 replaced by `made`, and the capacity of `band` raised
+/// to give room for `peak` ranges.
+void Splice(
+    Band& result, Band const& band, int first, int last, GrRange const* made, std::ptrdiff_t madeCount, int peak)
+{
+    int const count = static_cast<int>(madeCount);
+    int const tail = band.item_count - last;
+    if (&result == &band) {
+        if (peak > result.item_capacity) Resize(result, GrownCapacity(result.item_capacity, peak));
+        if (first + count != last) MoveSlots(result.items + first + count, result.items + last, tail);
+    } else {
+        int const capacity = GrownCapacity(band.item_count > 0 ? band.item_capacity : result.item_capacity, peak);
+        if (result.item_capacity < capacity) {
+            GrRange* const larger = NewSlots(result, capacity);
+            delete[] result.items;
+            result.items = larger;
+        }
+        result.item_capacity = capacity;
+        result.r1 = band.r1;
+        result.r2 = band.r2;
+        MoveSlots(result.items, band.items, first);
+        MoveSlots(result.items + first + count, band.items + last, tail);
+    }
+    MoveSlots(result.items + first, made, count);
+    result.item_count = first + count + tail;
+}
+
+/// True if the spans from the first to the last range have a pixel in common. Both bands have ranges.
+bool SpansMeet(Band const& a, Band const& b)
+{
+    return b.items[b.item_count - 1].r2 > a.items[0].r1 && b.items[0].r1 < a.items[a.item_count - 1].r2;
+}
+
+}
+
+void AssignUnion(Band& result, Band const& band, Band const& other)
+{
+    if (other.item_count <= 0) {
+        if (&result != &band) result = band;
+        return;
+    }
+    Window window(band, other);
+    GrRange* const made = window.buffer.Items();
+    GrRange* out = made;
+    GrRange const* next = band.items + window.first;
+    GrRange const* const end = band.items + window.last;
+    int const behind = band.item_count - window.last;
+    int peak = band.item_count;
+
+    GrRange const* const addedEnd = other.items + other.item_count;
+    for (GrRange const* added = other.items; added != addedEnd;) {
+        while (next != end && next->r2 <= added->r1)
+            *out++ = *next++;
+        GrRange joined = *added++;
+        if (next == end || next->r1 >= joined.r2)
+            peak = std::max(peak, static_cast<int>(window.first + (out - made) + 1 + (end - next) + behind));
+        // Whatever shares a pixel with the range melts into it; what only touches it stays apart.
+        for (;;) {
+            if (next != end && next->r1 < joined.r2) {
+                joined.r1 = std::min(joined.r1, next->r1);
+                joined.r2 = std::max(joined.r2, next->r2);
+                ++next;
+            } else if (added != addedEnd && added->r1 < joined.r2) {
+                joined.r2 = std::max(joined.r2, added->r2);
+                ++added;
+            } else {
+                break;
+            }
+        }
+        *out++ = joined;
+    }
+    Splice(result, band, window.first, static_cast<int>(next - band.items), made, out - made, peak);
+}
+
+void AssignDifference(Band& result, Band const& band, Band const& other)
+{
+    if (band.item_count <= 0 || other.item_count <= 0 || !SpansMeet(band, other)) {
+        if (&result != &band) result = band;
+        return;
+    }
+    Window window(band, other);
+    GrRange* const made = window.buffer.Items();
+    GrRange* out = made;
+    GrRange const* next = band.items + window.first;
+    GrRange const* const start = next;
+    GrRange const* const end = band.items + window.last;
+    GrRange const* cut = other.items;
+    GrRange const* const cutEnd = cut + other.item_count;
+    int peak = band.item_count;
+
+    while (next != end) {
+        GrRange rest = *next;
+        bool gone = false;
+        while (cut != cutEnd && cut->r1 < rest.r2) {
+            if (cut->r2 <= rest.r1) {
+                ++cut;
+                continue;
+            }
+            if (cut->r1 > rest.r1) *out++ = {rest.r1, cut->r1};
+            if (cut->r2 >= rest.r2) {
+                gone = true;
+                break;
+            }
+            // Two pieces of one range: only here is more written than was read.
+            if (cut->r1 > rest.r1)
+                peak = std::max(peak, static_cast<int>(band.item_count + (out - made) - (next - start)));
+            rest.r1 = cut->r2;
+            ++cut;
+        }
+        if (!gone) *out++ = rest;
+        ++next;
+    }
+    Splice(result, band, window.first, window.last, made, out - made, peak);
+}
+
+void AssignIntersection(Band& result, Band const& band, Band const& other)
+{
+    if (band.item_count <= 0) {
+        if (&result != &band) result = band;
+        return;
+    }
+    if (other.item_count <= 0 || !SpansMeet(band, other)) {
+        Splice(result, band, 0, band.item_count, nullptr, 0, 0);
+        return;
+    }
+    Window window(band, other);
+    GrRange* const made = window.buffer.Items();
+    GrRange* out = made;
+    GrRange const* next = band.items + window.first;
+    GrRange const* const end = band.items + window.last;
+    GrRange const* kept = other.items;
+    GrRange const* const keptEnd = kept + other.item_count;
+    int peak = band.item_count;
+
+    while (kept != keptEnd && next != end) {
+        GrRange const common{std::max(next->r1, kept->r1), std::min(next->r2, kept->r2)};
+        if (common.r1 < common.r2) *out++ = common;
+        if (kept->r2 >= next->r2) {
+            ++next;
+            continue;
+        }
+        ++kept;
+        // A second piece of the same range follows: more is written than was read.
+        if (common.r1 < common.r2 && kept != keptEnd && kept->r1 < next->r2)
+            peak = std::max(peak, static_cast<int>(band.item_count + (out - made) - (next - band.items)));
+    }
+    Splice(result, band, 0, band.item_count, made, out - made, peak);
+}
+
+void Band::AddRange(int from, int to)
+{
+    GrRange range{from, to};
+    Band single;
+    single.items = &range;
+    single.item_count = 1;
+    AssignUnion(*this, *this, single);
+}
+
+void Band::AddBand(Band const& other) { AssignUnion(*this, *this, other); }
+
+void Band::RemoveBand(Band const& other) { AssignDifference(*this, *this, other); }
+
+void Band::IntersectBand(Band const& other) { AssignIntersection(*this, *this, other); }
+
+void Band::InsertItemAfter(int i)
+{
+    int const need = item_count > i ? item_count + 1 : i + 2;
+    if (need > item_capacity) Resize(*this, GrownCapacity(item_capacity, need));
+    MoveSlots(items + i + 2, items + i + 1, item_count - i - 1);
+    item_count = need;
+}
+
+void Band::RemoveItems(int from, int to)
+{
+    GR_ASSERT_TEXT(from >= 0, "from>=0");
+    GR_ASSERT_TEXT(to >= from, "to>=from");
+    GR_ASSERT_TEXT(to < item_count, "to<items.item_count");
+    int const tail = std::max(item_count - to - 1, 0);
+    MoveSlots(items + from, items + to + 1, tail);
+    item_count = tail + from;
+}
+
+void Band::GetFullRange(GrRange& range) const
+{
+    range = item_count > 0 ? GrRange{items[0].r1, items[item_count - 1].r2} : GrRange{0, 0};
+}
+
+void Band::Offset(int dx)
+{
+    for (int i = 0; i < item_count; ++i) {
+        items[i].r1 += dx;
+        items[i].r2 += dx;
+    }
+}
+
+Band& Band::operator=(Band const& other)
+{
+    if (other.item_count > 0) {
+        Resize(*this, other.item_capacity);
+        MoveSlots(items, other.items, other.item_count);
+    }
+    item_count = other.item_count;
+    r1 = other.r1;
+    r2 = other.r2;
+    return *this;
+}
+
+bool Band::operator==(Band const& other) const
+{
+    return item_count == other.item_count && std::equal(items, items + item_count, other.items);
+}

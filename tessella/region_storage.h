@@ -1,0 +1,118 @@
+#pragma once
+
+#include <common/assert.h>
+#include <tessella/region.h>
+
+#include <algorithm>
+#include <cstring>
+
+/// How the lists of a region are kept, searched and moved; shared by the files of the region family.
+
+/// The whole family reports its assertions as one module.
+static constexpr char kSource[] = GR_SOURCE("tessella/region");
+
+/// Lists grow by this many slots.
+constexpr int kGrowth = 10;
+
+/// The recorded capacity after the growth, step by step, that gives room for `need` slots.
+constexpr int GrownCapacity(int capacity, int need)
+{
+    return need <= capacity ? capacity : capacity + (need - capacity + kGrowth - 1) / kGrowth * kGrowth;
+}
+
+/// Block moves of slots. A band moves with its storage: the slot it leaves must be overwritten, or a copy of a
+/// slot that was saved before must go somewhere, so that each range array keeps exactly one owner.
+template <typename T>
+void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
+{
+    if (count > 0) std::memmove(static_cast<void*>(to), from, static_cast<std::size_t>(count) * sizeof(T));
+}
+
+/// Makes the slots bands that own nothing.
+inline void ZeroSlots(GrRegion::Band* slots, std::ptrdiff_t count)
+{
+    std::memset(static_cast<void*>(slots), 0, static_cast<std::size_t>(count) * sizeof *slots);
+}
+
+inline GrRange* NewSlots(GrItemArray<GrRange> const&, int count)
+{
+    return new GrRange[static_cast<std::size_t>(count)];
+}
+
+inline GrRegion::Band* NewSlots(GrItemArray<GrRegion::Band> const&, int count)
+{
+    return new GrRegion::Band[static_cast<std::size_t>(count)]();
+}
+
+/// The first storage of a list that has none.
+template <typename T>
+void Allocate(GrItemArray<T>& list, int capacity)
+{
+    GR_ASSERT_TEXT(list.items == nullptr, "items==0");
+    list.items = NewSlots(list, capacity);
+    list.item_capacity = capacity;
+    list.item_count = 0;
+}
+
+/// Records the capacity; the block is only ever replaced by a larger one. What it held stays.
+template <typename T>
+void Resize(GrItemArray<T>& list, int capacity)
+{
+    if (list.item_capacity < capacity) {
+        T* const larger = NewSlots(list, capacity);
+        MoveSlots(larger, list.items, list.item_capacity);
+        delete[] list.items;
+        list.items = larger;
+    }
+    list.item_capacity = capacity;
+}
+
+/// The first entry that ends after `v`, or `item_count`.
+template <typename T>
+int FirstEndingAfter(GrItemArray<T> const& list, int v)
+{
+    int lo = 0;
+    int hi = list.item_count;
+    while (lo < hi) {
+        int const mid = (lo + hi) / 2;
+        if (v >= list.items[mid].r2)
+            lo = mid + 1;
+        else
+            hi = mid;
+    }
+    return lo;
+}
+
+/// The last entry that starts at or before `v`, or -1.
+template <typename T>
+int LastStartingBy(GrItemArray<T> const& list, int v)
+{
+    int lo = -1;
+    int hi = list.item_count - 1;
+    while (lo < hi) {
+        int const mid = (lo + hi + 1) / 2;
+        if (v < list.items[mid].r1)
+            hi = mid - 1;
+        else
+            lo = mid;
+    }
+    return lo;
+}
+
+/// The entry that holds `v`, or null.
+template <typename T>
+T const* Locate(GrItemArray<T> const& list, int v)
+{
+    int const slot = LastStartingBy(list, v);
+    return slot >= 0 && v < list.items[slot].r2 ? &list.items[slot] : nullptr;
+}
+
+/// `result` = `band`, followed by `AddBand`, `RemoveBand` or `IntersectBand` with `other`: the ranges and the
+/// capacity come out as if done in these two steps. `result` may be `band` itself. A band without ranges stays
+/// without under the latter two.
+void AssignUnion(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
+void AssignDifference(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
+void AssignIntersection(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
+
+/// False if the list of bands is out of order. Reports what it finds in detail, damaged ranges included.
+bool VerifyRegion(GrRegion const& region);

@@ -1,0 +1,3 @@
+#include <tessella/screen.h>
+
+constinit GrScreenRecord GrScreen;

@@ -1,0 +1,27 @@
+#pragma once
+
+#include <tessella/region.h>
+
+#include <atomic>
+#include <cstdint>
+#include <mutex>
+
+/// Serialises access to the framebuffer. Held from the start of the outermost guard to its end. Before it
+/// comes, in the order of locking, the mouse's mutex.
+extern std::recursive_mutex screenMutex;
+
+/// Above 0, nobody may draw or move the cursor on the screen. It rests at 1 while the pointer is not in use;
+/// guards then take no lock at all, as there is no cursor to protect. Under `screenMutex` but for that.
+extern std::atomic<std::uint32_t> hideCount;
+
+/// The bracket around all drawing on the framebuffer, for the pixels of a region or rectangle in screen
+/// coordinates. Guards nest on one thread, with any regions; a nested one costs one counter step.
+class GrScreenGuard {
+public:
+    explicit GrScreenGuard(GrRegion const& region);
+    explicit GrScreenGuard(GrRect const& rect);
+    ~GrScreenGuard();
+
+    GrScreenGuard(GrScreenGuard const&) = delete;
+    GrScreenGuard& operator=(GrScreenGuard const&) = delete;
+};

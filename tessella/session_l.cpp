@@ -1,0 +1,58 @@
+#include <tessella/session.h>
+
+#include <tessella/event_wait_l.h>
+#include <tessella/framebuffer_l.h>
+#include <tessella/session_state.h>
+#include <tessella/vga_l.h>
+#include <tessella/whole_screen.h>
+
+#include <signal.h>
+
+#include <cstdio>
+
+// What a failed start leaves behind is left on purpose: `GrDone` has nothing to do then, and there is no second
+// try in one process.
+bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
+{
+    if (initialized) return false;
+    sessionThread = pthread_self();
+    if (!OpenFramebuffer()) return false;
+    RequestVgaPorts();
+    CreateEventWait();
+    if (!GrSetVideoMode(width, height, depth, mode)) {
+        DestroyEventWait();
+        return false;
+    }
+    screenVisible = true;
+    signal(SIGUSR1, [](int) {});  // harmless from now on, whoever sends it
+    grabMutex.lock();
+    initialized = true;
+    ClearScreen();
+    return true;
+}
+
+void GrDone()
+{
+    if (!initialized) return;
+    ClearScreen();
+    DeleteScreenContext();
+    CloseFramebuffer();
+    grabMutex.unlock();
+    DestroyEventWait();
+    initialized = false;
+}
+
+bool GrChangeMode(unsigned& width, unsigned& height, unsigned& depth, unsigned)
+{
+    return GrSetVideoMode(width, height, depth, 0);
+}
+
+bool GrIsDdcSupport() { return false; }
+
+bool GrIsRefreshRateValid(unsigned, unsigned, unsigned) { return false; }
+
+void GrBeep()
+{
+    putchar('\a');
+    fflush(stdout);
+}

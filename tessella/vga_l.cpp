@@ -1,0 +1,11 @@
+#include <tessella/vga_l.h>
+
+#include <sys/io.h>
+
+namespace {
+
+constexpr unsigned long kGraphicsController = 0x3CE;  // index; its data port follows
+
+}
+
+void RequestVgaPorts() { static_cast<void>(ioperm(kGraphicsController, 2, 1)); }

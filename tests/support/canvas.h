@@ -1,0 +1,109 @@
+#pragma once
+
+#include <tessella/context.h>
+
+#include <cstdint>
+#include <cstring>
+#include <functional>
+#include <vector>
+
+/// The judge of contexts: a picture painted pixel by pixel, with the clip as one flag a pixel. It is slow and
+/// knows nothing of bands, spans or widths beyond a pixel's bytes. Coordinates off the surface are outside its
+/// limit, as they are outside that of a context.
+class Canvas {
+public:
+    struct Format {
+        int bytes;
+        std::uint32_t allBits;
+        std::function<std::uint32_t(GrColor)> toPixel;
+        std::function<GrColor(std::uint32_t)> fromPixel;
+    };
+
+    std::vector<unsigned char> memory;
+
+    Canvas(Format pixelFormat, int surfaceWidth, int surfaceHeight, int surfaceStride)
+        : memory(static_cast<std::size_t>(surfaceStride * surfaceHeight)), format(std::move(pixelFormat)),
+          width(surfaceWidth), height(surfaceHeight), stride(surfaceStride),
+          limit(static_cast<std::size_t>(width * height), true), clip(limit), back(format.allBits)
+    {}
+
+    void SetClipRegion(GrRegion const& region)
+    {
+        ForEachPixel([&](int x, int y, std::size_t i) {
+            clip[i] = limit[i] && region.Contains(x - originX, y - originY);
+        });
+    }
+    void ExcludeClip(GrRegion const& region)
+    {
+        ForEachPixel([&](int x, int y, std::size_t i) {
+            if (region.Contains(x - originX, y - originY)) clip[i] = false;
+        });
+    }
+    void ResetClipRegion() { clip = limit; }
+    void SetOrigin(int x, int y)
+    {
+        originX = x;
+        originY = y;
+    }
+    void SetForeColor(GrColor color) { fore = format.toPixel(color); }
+    void SetBackColor(GrColor color) { back = format.toPixel(color); }
+    void SetPattern(std::uint8_t const bits[8], int dx, int dy, bool isTransparent)
+    {
+        for (int y = 0; y < 8; ++y)
+            for (int x = 0; x < 8; ++x)
+                pattern[y][x] = bits[((y - dy) % 8 + 8) % 8] >> ((x - dx) % 8 + 8) % 8 & 1;
+        transparent = isTransparent;
+    }
+    void SetRasterMode(std::uint32_t mode) { copies = mode == 4; }
+
+    void DrawPixel(int x, int y) { Paint(x + originX, y + originY); }
+    void FillRegion(GrRegion const& region)
+    {
+        ForEachPixel([&](int x, int y, std::size_t) {
+            if (region.Contains(x - originX, y - originY)) Paint(x, y);
+        });
+    }
+    GrColor GetPixel(int x, int y) const
+    {
+        x += originX;
+        y += originY;
+        if (!InClip(x, y)) return 0;
+        std::uint32_t pixel = 0;
+        std::memcpy(&pixel, memory.data() + Offset(x, y), static_cast<std::size_t>(format.bytes));
+        return format.fromPixel(pixel);
+    }
+
+private:
+    template <typename Visit>
+    void ForEachPixel(Visit visit) const
+    {
+        for (int y = 0; y < height; ++y)
+            for (int x = 0; x < width; ++x)
+                visit(x, y, static_cast<std::size_t>(y * width + x));
+    }
+    bool InClip(int x, int y) const
+    {
+        return x >= 0 && y >= 0 && x < width && y < height && clip[static_cast<std::size_t>(y * width + x)];
+    }
+    std::size_t Offset(int x, int y) const { return static_cast<std::size_t>(y * stride + x * format.bytes); }
+    void Paint(int x, int y)
+    {
+        if (!InClip(x, y)) return;
+        bool const set = pattern[y % 8][x % 8];
+        if (!set && transparent) return;
+        unsigned char* const bytes = memory.data() + Offset(x, y);
+        for (int i = 0; i < format.bytes; ++i)
+            bytes[i] = static_cast<unsigned char>(copies ? (set ? fore : back) >> 8 * i : ~bytes[i]);
+    }
+
+    Format format;
+    int width, height, stride;
+    std::vector<bool> limit, clip;
+    int originX = 0, originY = 0;
+    std::uint32_t fore = 0, back;
+    bool pattern[8][8] = {{1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1},
+        {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1},
+        {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}};
+    bool transparent = false;
+    bool copies = true;
+};

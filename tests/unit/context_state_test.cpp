@@ -1,0 +1,175 @@
+#include <tessella/event_wait_l.h>
+#include <tessella/image.h>
+#include <tessella/mouse.h>
+#include <tessella/screen.h>
+#include <tessella/screen_guard.h>
+#include <tessella/video_mode.h>
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <thread>
+
+namespace {
+
+std::unique_ptr<GrContextI> ImageContext(GrImage const& image)
+{
+    return std::unique_ptr<GrContextI>(static_cast<GrContextI*>(image.GetContext()));
+}
+
+GrRect ClipRect(GrContext& context)
+{
+    GrRect rect;
+    context.GetClipRect(rect);
+    return rect;
+}
+
+TEST(ContextState, ClipLiesOnTheSurfaceAndIsSeenFromTheOrigin)
+{
+    GrImage const image(20, 20, GrImageTrueColor);
+    auto const context = ImageContext(image);
+    context->SetOrigin(3, 4);
+    context->SetClipRegion(GrRect{0, 0, 10, 100});
+    EXPECT_EQ(ClipRect(*context), (GrRect{0, 0, 10, 16}));
+    context->SetOrigin(5, 5);
+    EXPECT_EQ(ClipRect(*context), (GrRect{-2, -1, 8, 15}));
+    GrRegion clip;
+    context->GetClipRegion(clip);
+    EXPECT_TRUE(clip.Contains(-2, -1) && clip.Contains(7, 14) && !clip.Contains(8, 14));
+}
+
+TEST(ContextState, BaseOriginMovesTheOriginAndLimitBoundsTheClip)
+{
+    GrImage const image(20, 20, GrImageTrueColor);
+    auto const context = ImageContext(image);
+    int x = -1, y = -1;
+    context->SetOrigin(7, 7);
+    context->SetBaseOrigin(2, 3);
+    context->GetOrigin(x, y);
+    EXPECT_EQ(x, 0);
+    EXPECT_EQ(y, 0);
+    context->SetLimitRegion(GrRect{0, 0, 5, 5});
+    context->SetOrigin(1, 1);
+    context->GetOrigin(x, y);
+    EXPECT_EQ(x, 1);
+    context->ExcludeClipRect({-1, -1, 2, 20});
+    EXPECT_EQ(ClipRect(*context), (GrRect{2, -1, 4, 4}));
+    context->ResetClipRegion();
+    EXPECT_EQ(ClipRect(*context), (GrRect{-1, -1, 4, 4})) << "the limit stays";
+    context->SetClipRegion(GrRect{-9, -9, 99, 99});
+    EXPECT_EQ(ClipRect(*context), (GrRect{-1, -1, 4, 4}));
+}
+
+TEST(ContextState, AScreenContextStartsAtItsOrigin)
+{
+    std::unique_ptr<GrContext> const context(
+        FindVideoMode(16, 16)->createScreenContext(GrRect{10, 10, 30, 20}, 10, 12));
+    EXPECT_EQ(ClipRect(*context), (GrRect{0, -2, 20, 8}));
+    int x = -1, y = -1;
+    context->GetOrigin(x, y);
+    EXPECT_EQ(x, 0);
+    context->SetOrigin(1, 0);
+    EXPECT_EQ(ClipRect(*context), (GrRect{-1, -2, 19, 8}));
+    EXPECT_EQ(context->GetRasterMode(), 4u);
+    context->SetRasterMode(77);
+    EXPECT_EQ(context->GetRasterMode(), 77u);
+    EXPECT_EQ(dynamic_cast<GrContextI*>(context.get()), nullptr);
+}
+
+TEST(ContextState, EmptyClipPaintsNothingUntilReset)
+{
+    GrImage const image(4, 4, GrImageTrueColor);
+    auto const context = ImageContext(image);
+    context->SetForeColor(0xABCDEF);
+    context->SetClipRegion(GrRegion());
+    context->FillRegion(GrRect{0, 0, 4, 4});
+    context->DrawPixel(1, 1);
+    context->ResetClipRegion();
+    EXPECT_EQ(context->GetPixel(1, 1), 0u);
+    context->FillRegion(GrRect{2, 0, 2, 4});
+    EXPECT_EQ(context->GetPixel(2, 1), 0u);
+    context->DrawPixel(1, 1);
+    EXPECT_EQ(context->GetPixel(1, 1), 0xABCDEFu);
+}
+
+TEST(LoadTime, StateStandsBeforeAnySession)
+{
+    EXPECT_EQ(GrScreen.fbFd, -1);
+    EXPECT_EQ(mouseFd, -1);
+    EXPECT_EQ(mouseButtons, 7u);
+    EXPECT_EQ(emulatedButtons, 7u);
+    EXPECT_EQ(hideCount, 1u);
+    for (auto* const mutex : {&screenMutex, &grabMutex}) {
+        std::scoped_lock const once(*mutex);
+        EXPECT_TRUE(mutex->try_lock()) << "recursive";
+        mutex->unlock();
+    }
+}
+
+bool FreeForOthers()
+{
+    bool free = false;
+    std::thread([&] {
+        free = screenMutex.try_lock();
+        if (free) screenMutex.unlock();
+    }).join();
+    return free;
+}
+
+TEST(ScreenGuard, TakesTheLockOnlyWhileThePointerIsInUse)
+{
+    {
+        GrScreenGuard const guard(GrRegion{});
+        EXPECT_EQ(hideCount, 2u);
+        EXPECT_TRUE(FreeForOthers());
+    }
+    EXPECT_EQ(hideCount, 1u);
+
+    hideCount = 0;
+    try {
+        GrScreenGuard const outer(GrRect{0, 0, 5, 5});
+        EXPECT_FALSE(FreeForOthers());
+        {
+            GrScreenGuard const inner(GrRegion{});
+            EXPECT_EQ(hideCount, 2u);
+        }
+        EXPECT_FALSE(FreeForOthers()) << "the outermost guard keeps it";
+        throw 1;
+    } catch (int) {
+        EXPECT_EQ(hideCount, 0u);
+        EXPECT_TRUE(FreeForOthers());
+    }
+    hideCount = 1;
+}
+
+TEST(VideoMode, IsFoundByBitsFirstAndColourBitsThen)
+{
+    struct Case {
+        unsigned bits, colorBits, depth, bytes;
+    };
+    for (auto const& c : {Case{8, 0, 8, 1}, Case{8, 24, 8, 1}, Case{16, 15, 15, 2}, Case{16, 16, 16, 2},
+             Case{24, 24, 24, 3}, Case{32, 24, 24, 4}}) {
+        auto const* const mode = FindVideoMode(c.bits, c.colorBits);
+        ASSERT_NE(mode, nullptr) << c.bits;
+        EXPECT_EQ(mode->depth, c.depth);
+        EXPECT_EQ(mode->bytesPerPixel, c.bytes);
+    }
+    for (auto const& c :
+        {Case{24, 16, 0, 0}, Case{32, 30, 0, 0}, Case{15, 15, 0, 0}, Case{16, 12, 0, 0}, Case{1, 3, 0, 0}})
+        EXPECT_EQ(FindVideoMode(c.bits, c.colorBits), nullptr) << c.bits << ' ' << c.colorBits;
+}
+
+TEST(VideoMode, ColourMapHoldsTheCubeWithRedFastest)
+{
+    GrColorMap const map = MakeColorMap();
+    EXPECT_EQ(map.red[0] | map.green[0] | map.blue[0], 0);
+    EXPECT_EQ(map.red[255], 0x3F) << "next to black on the 16-bit scale";
+    EXPECT_EQ(map.green[255], 0x3F);
+    EXPECT_EQ(map.blue[255], 0x3F);
+    EXPECT_EQ(map.red[20 + 36 * 1 + 6 * 2 + 3], 153 << 8);
+    EXPECT_EQ(map.green[20 + 36 * 1 + 6 * 2 + 3], 102 << 8);
+    EXPECT_EQ(map.blue[20 + 36 * 1 + 6 * 2 + 3], 51 << 8);
+    EXPECT_EQ(map.red[235] & map.green[235] & map.blue[235], 255 << 8);
+}
+
+}

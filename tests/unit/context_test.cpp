@@ -1,0 +1,225 @@
+#include <support/canvas.h>
+#include <tessella/pixel/image_contexts.h>
+#include <tessella/screen.h>
+#include <tessella/screen_guard.h>
+#include <tessella/video_mode.h>
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <random>
+
+#include <sys/mman.h>
+
+// Random drawing on contexts of every format, over images and over a screen with a row pitch of its own, judged
+// by a canvas: after each operation every byte must be the same, also those that belong to no pixel.
+
+namespace {
+
+constexpr int kWidth = 53, kHeight = 37;
+
+template <typename Surface, typename Colors>
+Canvas::Format FormatOf()
+{
+    return {Surface::kBytes, Surface::kAllBits, [](GrColor c) { return Colors::ToPixel(c); },
+        [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); }};
+}
+
+class RandomDrawing {
+public:
+    RandomDrawing(GrContext& drawnContext, Canvas& judgingCanvas, unsigned seed)
+        : context(drawnContext), canvas(judgingCanvas), random(seed)
+    {}
+
+    void Step()
+    {
+        switch (Number(0, 11)) {
+        case 0: Both([region = Shape()](auto& c) { c.SetClipRegion(region); }); break;
+        case 1: {
+            GrRect const rect = Rect();
+            context.ExcludeClipRect(rect);
+            canvas.ExcludeClip(rect);
+            break;
+        }
+        case 2: {
+            GrRegion const region = Shape();
+            context.ExcludeClipRegion(region);
+            canvas.ExcludeClip(region);
+            break;
+        }
+        case 3: Both([](auto& c) { c.ResetClipRegion(); }); break;
+        case 4: Both([x = Number(-9, 9), y = Number(-9, 9)](auto& c) { c.SetOrigin(x, y); }); break;
+        case 5: Both([color = Color()](auto& c) { c.SetForeColor(color); }); break;
+        case 6: Both([color = Color()](auto& c) { c.SetBackColor(color); }); break;
+        case 7: SetPattern(); break;
+        case 8: Both([mode = Number(0, 2) ? 4u : 7u](auto& c) { c.SetRasterMode(mode); }); break;
+        case 9: {
+            int const x = Number(-5, kWidth + 5), y = Number(-5, kHeight + 5);
+            Both([=](auto& c) { c.DrawPixel(x, y); });
+            EXPECT_EQ(context.GetPixel(x, y), canvas.GetPixel(x, y)) << x << ", " << y;
+            break;
+        }
+        default: Both([region = Shape()](auto& c) { c.FillRegion(region); });
+        }
+    }
+
+private:
+    template <typename Operation>
+    void Both(Operation operation)
+    {
+        operation(context);
+        operation(canvas);
+    }
+
+    int Number(int from, int to) { return std::uniform_int_distribution(from, to)(random); }
+    GrColor Color() { return static_cast<GrColor>(random()); }
+    GrRect Rect()
+    {
+        int const x = Number(-15, kWidth), y = Number(-15, kHeight);
+        return {x, y, x + Number(0, 40), y + Number(0, 30)};
+    }
+    /// Only cut from one rectangle, never joined: joining may leave holes between bands, which the canvas, a
+    /// plain set of pixels, does not have.
+    GrRegion Shape()
+    {
+        GrRegion region = Rect();
+        for (int cuts = Number(0, 3); cuts > 0; --cuts)
+            region -= Rect();
+        return region;
+    }
+    void SetPattern()
+    {
+        std::uint8_t bits[8];
+        int const kind = Number(0, 3);
+        for (auto& byte : bits)
+            byte = kind == 0 ? 0xFF : kind == 1 ? 0 : static_cast<std::uint8_t>(random());
+        int const dx = Number(-20, 20), dy = Number(-20, 20);
+        bool const transparent = Number(0, 1) != 0;
+        Both([&](auto& c) { c.SetPattern(bits, dx, dy, transparent); });
+    }
+
+    GrContext& context;
+    Canvas& canvas;
+    std::mt19937 random;
+};
+
+void Judge(GrContext& context, unsigned char const* pixels, Canvas& canvas)
+{
+    unsigned const seed = std::random_device{}();
+    SCOPED_TRACE("seed " + std::to_string(seed));
+    RandomDrawing drawing(context, canvas, seed);
+    for (int step = 0; step < 3000; ++step) {
+        drawing.Step();
+        ASSERT_EQ(std::memcmp(pixels, canvas.memory.data(), canvas.memory.size()), 0) << "step " << step;
+    }
+}
+
+template <typename Surface, typename Colors>
+void JudgeImage()
+{
+    Canvas canvas(FormatOf<Surface, Colors>(), kWidth, kHeight, kWidth * Surface::kBytes);
+    GrImage image(kWidth, kHeight, new unsigned char[canvas.memory.size()](), nullptr, 0);
+    std::unique_ptr<GrContext> const context(CreateImageContext<Surface, Colors>(&image));
+    Judge(*context, image.pixels, canvas);
+}
+
+TEST(Contexts, ImagesOfEveryFormatMatchTheCanvas)
+{
+    JudgeImage<GrSurface8, GrColors4>();
+    JudgeImage<GrSurface8, GrColors8>();
+    JudgeImage<GrSurface16, GrColors15>();
+    JudgeImage<GrSurface16, GrColors16>();
+    JudgeImage<GrSurface24, GrColors24>();
+    JudgeImage<GrSurface32, GrColors24>();
+    JudgeImage<GrSurface32, GrColorsRGB>();
+    JudgeImage<GrSurface32, GrColorsRGBA>();
+}
+
+/// A screen in this process' memory, rows being five bytes longer than they need to be.
+template <typename Surface, typename Colors>
+void JudgeScreen(unsigned bits, unsigned colorBits)
+{
+    SCOPED_TRACE(bits * 100 + colorBits);
+    int const stride = kWidth * Surface::kBytes + 5;
+    Canvas canvas(FormatOf<Surface, Colors>(), kWidth, kHeight, stride);
+    std::vector<unsigned char> memory(canvas.memory.size());
+    GrScreen.fbMemory = memory.data();
+    GrScreen.stride = static_cast<std::uint32_t>(stride);
+    auto const* const mode = FindVideoMode(bits, colorBits);
+    ASSERT_NE(mode, nullptr);
+    std::unique_ptr<GrContext> const context(mode->createScreenContext(GrRect{0, 0, kWidth, kHeight}, 0, 0));
+    Judge(*context, memory.data(), canvas);
+    GrScreen = {};
+}
+
+TEST(Contexts, ScreensOfEveryModeMatchTheCanvas)
+{
+    JudgeScreen<GrSurface8, GrColors8>(8, 18);
+    JudgeScreen<GrSurface16, GrColors15>(16, 15);
+    JudgeScreen<GrSurface16, GrColors16>(16, 16);
+    JudgeScreen<GrSurface24, GrColors24>(24, 24);
+    JudgeScreen<GrSurface32, GrColors24>(32, 24);
+}
+
+TEST(Contexts, WithoutAMappingTheScreenPaintsNothing)
+{
+    for (void* const memory : {static_cast<void*>(nullptr), MAP_FAILED}) {
+        GrScreen.fbMemory = static_cast<unsigned char*>(memory);
+        GrScreen.stride = 64;
+        std::unique_ptr<GrContext> const context(
+            FindVideoMode(32, 24)->createScreenContext(GrRect{0, 0, 16, 16}, 0, 0));
+        context->FillRegion(GrRect{0, 0, 16, 16});
+        context->DrawPixel(3, 3);
+        EXPECT_EQ(context->GetPixel(3, 3), 0u);
+        EXPECT_EQ(hideCount, 1u) << "guards were left";
+    }
+    GrScreen = {};
+}
+
+/// Gives a test the row operations that other drawing is made of.
+struct Rows : GrGenericContext<GrGenericSurface<GrImageContextBase<3>, GrSurface24>, GrColors24> {
+    explicit Rows(GrImage const& image) : GrGenericContext(image) {}
+    using GrGenericSurface::CopyRowsIn;
+    using GrGenericSurface::CopyRowsOut;
+    using GrGenericSurface::PatternColumn;
+};
+
+TEST(Rows, CopyBetweenSurfaceAndImageOfTheSameFormat)
+{
+    GrImage surface(9, 6, new unsigned char[9 * 6 * 3](), nullptr, 0);
+    GrImage source(5, 4, new unsigned char[5 * 4 * 3], nullptr, 0);
+    GrImage target(4, 5, new unsigned char[4 * 5 * 3](), nullptr, 0);
+    for (unsigned char i = 0; i < 60; ++i)
+        source.pixels[i] = static_cast<unsigned char>(i + 1);
+    Rows const rows(surface);
+    rows.CopyRowsIn({2, 5}, {1, 4}, source, 1, 1);
+    rows.CopyRowsOut({1, 5}, {0, 4}, target, 0, 1);
+    for (int y = 0; y < 5; ++y)
+        for (int x = 0; x < 4; ++x)
+            for (int byte = 0; byte < 3; ++byte) {
+                bool const copied = x >= 1 && y >= 2;
+                EXPECT_EQ(
+                    target.pixels[(y * 4 + x) * 3 + byte], copied ? ((y - 1) * 5 + x) * 3 + byte + 1 : 0)
+                    << x << ", " << y << ", " << byte;
+            }
+}
+
+TEST(Rows, ColumnFollowsThePatternAndIgnoresTheRasterMode)
+{
+    static constexpr std::uint8_t kBits[8] = {2, 0, 2, 0, 2, 2, 0, 0};
+    for (bool const transparent : {false, true}) {
+        GrImage image(3, 9, new unsigned char[3 * 9 * 3](), nullptr, 0);
+        Rows rows(image);
+        rows.SetPattern(kBits, 0, 0, transparent);
+        rows.SetRasterMode(0);
+        rows.PatternColumn(1, 1, 7, 0x010203, 0x040506);
+        for (int y = 0; y < 9; ++y) {
+            int const expected = y < 1 || y > 7 ? 0 : kBits[y] ? 0x010203 : transparent ? 0 : 0x040506;
+            unsigned char const* const pixel = image.pixels + (y * 3 + 1) * 3;
+            EXPECT_EQ(pixel[0] | pixel[1] << 8 | pixel[2] << 16, expected) << y;
+            EXPECT_EQ(pixel[-1] | pixel[3], 0) << "neighbours";
+        }
+    }
+}
+
+}

@@ -1,0 +1,90 @@
+#include <tessella/image.h>
+#include <tessella/pixel/image_contexts.h>
+#include <tessella/screen.h>
+#include <tessella/video_mode.h>
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <typeinfo>
+
+namespace {
+
+template <typename Surface, typename Colors>
+bool Is(std::unique_ptr<GrContext> const& context)
+{
+    return typeid(*context) == typeid(GrImageContext<Surface, Colors>);
+}
+
+std::unique_ptr<GrContext> ContextFor(int bits, int bytes, std::uint32_t flags = 0)
+{
+    GrImage image(3, 3, new unsigned char[36](), nullptr, flags);
+    if (!(flags & GrImageTrueColor)) {
+        image.bits = bits;
+        image.bytes = bytes;
+    }
+    return std::unique_ptr<GrContext>(image.GetContext());
+}
+
+TEST(Image, ContextFollowsTheFormat)
+{
+    EXPECT_TRUE((Is<GrSurface8, GrColors4>(ContextFor(4, 1))));
+    EXPECT_TRUE((Is<GrSurface8, GrColors8>(ContextFor(8, 1))));
+    EXPECT_TRUE((Is<GrSurface16, GrColors15>(ContextFor(15, 2))));
+    EXPECT_TRUE((Is<GrSurface16, GrColors16>(ContextFor(16, 2))));
+    EXPECT_TRUE((Is<GrSurface24, GrColors24>(ContextFor(24, 3))));
+    EXPECT_TRUE((Is<GrSurface32, GrColors24>(ContextFor(32, 4))));
+    EXPECT_TRUE((Is<GrSurface32, GrColorsRGB>(ContextFor(0, 0, GrImageTrueColor))));
+    EXPECT_TRUE((Is<GrSurface32, GrColorsRGBA>(ContextFor(0, 0, GrImageTrueColor | GrImagePremultiplied))));
+
+    GrScreen.depth = 24;
+    GrScreen.createImageContext = FindVideoMode(32, 24)->createImageContext;
+    EXPECT_TRUE((Is<GrSurface32, GrColors24>(ContextFor(24, 4)))) << "the screen's own format comes first";
+    GrScreen = {};
+
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(ContextFor(0, 0), nullptr);
+    EXPECT_NE(
+        testing::internal::GetCapturedStderr().find("Assertion failed: false, file "), std::string::npos);
+}
+
+TEST(Image, TakesTheScreensFormatUnlessTrueColorIsAskedFor)
+{
+    GrScreen.depth = 16;
+    GrScreen.bytesPerPixel = 2;
+    GrImage const native(3, 2, GrImageNoDither);
+    GrScreen = {};
+    EXPECT_EQ(native.bits, 16);
+    EXPECT_EQ(native.bytes, 2);
+    EXPECT_EQ(native.flags, GrImageNoDither);
+    EXPECT_EQ(native.alphaPlane, nullptr);
+    for (int i = 0; i < 12; ++i)
+        EXPECT_EQ(native.pixels[i], 0);
+
+    GrImage const both(3, 2, GrImageHasAlpha);
+    EXPECT_EQ(both.flags, GrImageHasAlpha | GrImageTrueColor);
+    EXPECT_EQ(both.bits, 32);
+    EXPECT_EQ(both.bytes, 4);
+    EXPECT_TRUE(both.pixels && both.alphaPlane);
+
+    GrImage alphaOnly(3, 2, GrImageHasAlpha | GrImageAlphaOnly);
+    EXPECT_EQ(alphaOnly.pixels, nullptr);
+    EXPECT_NE(alphaOnly.alphaPlane, nullptr);
+    std::unique_ptr<GrContext> const context(alphaOnly.GetContext());
+    context->FillRegion(GrRect{0, 0, 3, 2});
+    EXPECT_EQ(context->GetPixel(1, 1), 0u) << "there are no pixels to paint";
+    alphaOnly.SetFlags(~0u);
+    EXPECT_EQ(alphaOnly.flags,
+        GrImageHasAlpha | GrImageAlphaOnly | GrImageTrueColor | GrImageNoDither | GrImageOverBack);
+    alphaOnly.SetFlags(GrImageOverBack);
+    EXPECT_EQ(alphaOnly.flags & (GrImageNoDither | GrImageOverBack), GrImageOverBack + 0u);
+
+    GrImage const nothing(0, 2, GrImageHasAlpha);
+    EXPECT_TRUE(!nothing.pixels && !nothing.alphaPlane);
+
+    unsigned char pixels[4], alpha[1];
+    GrImage borrowed(1, 1, pixels, alpha, GrImageTrueColor);
+    borrowed.Detach();
+}
+
+}

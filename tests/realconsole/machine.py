@@ -1,0 +1,206 @@
+"""A virtual PC that boots Debian's kernel into a real framebuffer console.
+
+    with boot(16, [program], kernel_folder, work_folder) as machine:
+        machine.start(program)
+        machine.wait_line("ready")
+        picture = machine.screenshot()
+
+The processor is always emulated: a /dev/kvm that opens may still be unable to run a guest, and the emulation
+boots in seconds and behaves the same on every machine.
+"""
+
+import json
+import shutil
+import socket
+import subprocess
+import time
+from pathlib import Path
+
+import picture
+from initramfs import Initramfs, MissingPart
+
+# The boot loader's number of the 1024x768 mode with so many bits a pixel.
+VGA_MODES = {8: 0x305, 15: 0x316, 16: 0x317, 24: 0x318, 32: 0x344}
+
+BOOT_SECONDS = 60
+ANSWER_SECONDS = 20
+
+
+class MachineError(Exception):
+    """The guest did not do what was waited for; the text tells what it said and where its log is."""
+
+
+def boot(bits: int, programs: list[Path], kernel_folder: Path, work_folder: Path) -> "Machine":
+    """Starts a machine with a 1024x768 framebuffer of `bits` bits a pixel and waits until it takes commands.
+
+    `programs` are put, with their libraries, at the paths they have here. `work_folder` (made if needed)
+    takes the boot archive and console.log, the kernel's messages. Raises MissingPart or MachineError."""
+    emulator = _tool("qemu-system-x86_64", "qemu-system-x86")
+    kernel = kernel_folder / "vmlinuz"
+    if not kernel.exists():
+        raise MissingPart(f"{kernel} is missing: run scripts/fetch-kernel (Debian package linux-image-amd64)")
+    work_folder.mkdir(parents=True, exist_ok=True)
+    archive = work_folder / "initramfs.cpio"
+    _make_initramfs(programs).write(archive)
+
+    machine = Machine(work_folder)
+    try:
+        machine.power_on(emulator, kernel, archive, VGA_MODES[bits])
+        machine.wait_line("booted", BOOT_SECONDS)
+    except BaseException:
+        machine.stop()
+        raise
+    return machine
+
+
+class Machine:
+    """A running guest: a command line on a serial port, and the monitor. Made by boot(); stop() ends it, and
+    so does leaving a `with` block. Nothing survives the process that made it."""
+
+    def __init__(self, work_folder: Path) -> None:
+        self.log = work_folder / "console.log"
+        self._screendump = work_folder / "screendump.ppm"
+        self._emulator: subprocess.Popen | None = None
+        self._serial, self._serial_end = socket.socketpair()
+        self._monitor, self._monitor_end = socket.socketpair()
+        self._monitor.settimeout(ANSWER_SECONDS)
+        self._monitor_stream = self._monitor.makefile("rb")
+        self._received = b""
+
+    def power_on(self, emulator: str, kernel: Path, archive: Path, vga_mode: int) -> None:
+        # quiet and a hidden text cursor: nothing but the program draws on the framebuffer.
+        command_line = f"console=ttyS0 quiet vt.global_cursor_default=0 vga={vga_mode:#x} panic=-1"
+        serial, monitor = self._serial_end.fileno(), self._monitor_end.fileno()
+        self._emulator = subprocess.Popen(
+            # The kernel ends the emulator should this process be killed.
+            ["setpriv", "--pdeathsig", "KILL", emulator]
+            + ["-nodefaults", "-no-user-config", "-no-reboot", "-accel", "tcg", "-m", "256"]
+            + ["-vga", "std", "-display", "none"]
+            + ["-kernel", str(kernel), "-initrd", str(archive), "-append", command_line]
+            + ["-serial", f"file:{self.log}"]
+            + ["-chardev", f"socket,id=serial,fd={serial}", "-serial", "chardev:serial"]
+            + ["-chardev", f"socket,id=monitor,fd={monitor}", "-mon", "chardev=monitor,mode=control"],
+            stdin=subprocess.DEVNULL,
+            stdout=subprocess.DEVNULL,
+            stderr=subprocess.PIPE,
+            pass_fds=(serial, monitor),
+        )
+        self._serial_end.close()
+        self._monitor_end.close()
+        self._monitor_reply()  # the greeting
+        self._qmp("qmp_capabilities")
+
+    def start(self, command: object) -> None:
+        """Runs a shell command in the guest. It reads what send_line() sends; finish() waits for its end."""
+        self.send_line(command)
+
+    def send_line(self, text: object = "") -> None:
+        self._serial.sendall(f"{text}\n".encode())
+
+    def wait_line(self, expected: str, seconds: float = ANSWER_SECONDS) -> list[str]:
+        """Waits for a line that is `expected` and returns the lines that came before it."""
+        return self._lines_until(lambda line: line == expected, f'line "{expected}"', seconds)[:-1]
+
+    def finish(self, seconds: float = ANSWER_SECONDS) -> tuple[int, list[str]]:
+        """Waits for the running command's end: its exit status and what it wrote since the last wait."""
+        lines = self._lines_until(lambda line: line.startswith("status "), "end of the command", seconds)
+        return int(lines[-1].split()[1]), lines[:-1]
+
+    def run(self, command: object, seconds: float = ANSWER_SECONDS) -> tuple[int, list[str]]:
+        self.start(command)
+        return self.finish(seconds)
+
+    def monitor(self, command: str) -> str:
+        """Gives the emulator's monitor a line like "sendkey a" or "mouse_move 10 5"; returns its answer."""
+        return self._qmp("human-monitor-command", {"command-line": command})
+
+    def screenshot(self) -> picture.Picture:
+        self._qmp("screendump", {"filename": str(self._screendump)})
+        return picture.read_ppm(self._screendump)
+
+    def stop(self) -> None:
+        if self._emulator is not None:
+            self._emulator.kill()
+            self._emulator.communicate()
+            self._emulator = None
+        for end in (self._serial, self._serial_end, self._monitor_stream, self._monitor, self._monitor_end):
+            end.close()
+
+    def __enter__(self) -> "Machine":
+        return self
+
+    def __exit__(self, *_: object) -> None:
+        self.stop()
+
+    def _lines_until(self, is_last, purpose: str, seconds: float) -> list[str]:
+        deadline = time.monotonic() + seconds
+        lines: list[str] = []
+        while not (lines and is_last(lines[-1])):
+            line, newline, rest = self._received.partition(b"\n")
+            if newline:
+                self._received = rest
+                lines.append(line.decode(errors="replace"))
+            elif not self._receive(deadline):
+                said = "\n".join([*lines, line.decode(errors="replace")]).rstrip()
+                raise MachineError(f"no {purpose} in {seconds} s; the guest said:\n{said}\n{self._state()}")
+        return lines
+
+    def _receive(self, deadline: float) -> bool:
+        """Adds what comes next on the serial port; False at the deadline or if the machine has ended."""
+        self._serial.settimeout(max(deadline - time.monotonic(), 0.001))
+        try:
+            data = self._serial.recv(4096)
+        except (TimeoutError, ConnectionError):
+            return False
+        self._received += data
+        return bool(data)
+
+    def _qmp(self, command: str, arguments: dict | None = None):
+        request = {"execute": command, "arguments": arguments or {}}
+        try:
+            self._monitor.sendall(json.dumps(request).encode())
+        except ConnectionError:
+            raise MachineError(f"the monitor took no {command}; {self._state()}") from None
+        reply = self._monitor_reply()
+        while "event" in reply:
+            reply = self._monitor_reply()
+        if "error" in reply:
+            raise MachineError(f"monitor: {command}: {reply['error']['desc']}")
+        return reply["return"]
+
+    def _monitor_reply(self) -> dict:
+        try:
+            line = self._monitor_stream.readline()
+        except (TimeoutError, ConnectionError):
+            line = b""
+        if not line:
+            raise MachineError(f"the monitor does not answer; {self._state()}")
+        return json.loads(line)
+
+    def _state(self) -> str:
+        try:
+            self._emulator.wait(1)  # its ends of the sockets close a moment before it ends
+        except subprocess.TimeoutExpired:
+            return f"the kernel's messages are in {self.log}"
+        reason = self._emulator.stderr.read().decode(errors="replace").strip()
+        return f"the emulator ended with status {self._emulator.returncode}: {reason}"
+
+
+def _make_initramfs(programs: list[Path]) -> Initramfs:
+    busybox = Path(_tool("busybox", "busybox-static"))
+    guest = Initramfs()
+    for folder in ("bin", "dev", "proc", "sys", "tmp"):
+        guest.add_folder(folder)
+    guest.add_program(busybox)
+    guest.add_file("/bin/busybox", busybox)
+    guest.add_file("/init", Path(__file__).with_name("init"))
+    for program in programs:
+        guest.add_program(program)
+    return guest
+
+
+def _tool(name: str, package: str) -> str:
+    path = shutil.which(name)
+    if path is None:
+        raise MissingPart(f"{name} is missing: install the Debian package {package}")
+    return path

@@ -1,0 +1,104 @@
+"""Runs programs on a real framebuffer console and on the virtual console: both must show the same screen."""
+
+import argparse
+import subprocess
+import sys
+from pathlib import Path
+
+import machine
+import picture
+
+VIRTUAL_SECONDS = 60
+
+
+class Difference(Exception):
+    """The two consoles do not show the same; the text names the pictures."""
+
+
+def main() -> int:
+    options = parse_options()
+    try:
+        programs = [options.example, options.pattern]
+        with machine.boot(options.bits, programs, options.kernel, options.keep) as real:
+            # The example first: it is to meet the screen as the kernel leaves it.
+            compare_program(real, options, options.example)
+            compare_program(real, options, options.pattern)
+    except (Difference, machine.MachineError, machine.MissingPart, ValueError, OSError) as error:
+        print(f"realconsole.{options.bits}: {error}", file=sys.stderr)
+        return 1
+    return 0
+
+
+def parse_options() -> argparse.Namespace:
+    parser = argparse.ArgumentParser(description=__doc__)
+    parser.add_argument("--bits", type=int, required=True, choices=sorted(machine.VGA_MODES))
+    parser.add_argument("--example", type=Path, required=True, help="holds its picture with --hold")
+    parser.add_argument("--pattern", type=Path, required=True, help="the same, and tells of the device")
+    parser.add_argument("--console", type=Path, required=True, help="the virtual console")
+    parser.add_argument("--kernel", type=Path, required=True, help="what scripts/fetch-kernel left")
+    parser.add_argument("--keep", type=Path, required=True, help="the folder for pictures and logs")
+    return parser.parse_args()
+
+
+def compare_program(real: machine.Machine, options: argparse.Namespace, program: Path) -> None:
+    """With --hold a program says "ready" when its picture stands and cleans up after one line of input;
+    without, it ends and leaves the picture."""
+    real.start(f"{program} --hold")
+    real_words = real.wait_line("ready")
+    real_screen = real.screenshot()
+    real.send_line()
+    status, last_words = real.finish()
+    if status != 0:
+        raise Difference(f"{program.name} ended with status {status} on the real console: {last_words}")
+
+    stem = options.keep / program.name
+    virtual_words, virtual_screen = run_on_virtual_console(options, program, stem.with_suffix(".virtual.png"))
+    if virtual_words != real_words:
+        raise Difference(f"{program.name} wrote {real_words} on the real console, virtually {virtual_words}")
+    compare_screens(real_screen, virtual_screen, stem)
+
+
+def run_on_virtual_console(
+    options: argparse.Namespace, program: Path, screenshot: Path
+) -> tuple[list[str], picture.Picture]:
+    screenshot.unlink(missing_ok=True)
+    mode = f"1024x768x{options.bits}"
+    command = [options.console, "--mode", mode, "--screenshot", screenshot, "--", program]
+    try:
+        result = subprocess.run(command, capture_output=True, text=True, timeout=VIRTUAL_SECONDS, check=False)
+    except subprocess.TimeoutExpired:
+        raise Difference(f"{program.name} does not end on the virtual console") from None
+    if result.returncode != 0:
+        raise Difference(
+            f"{program.name} ended with status {result.returncode} on the virtual console: "
+            + (result.stdout + result.stderr).strip()
+        )
+    return result.stdout.splitlines(), picture.read_png(screenshot)
+
+
+def compare_screens(real: picture.Picture, virtual: picture.Picture, stem: Path) -> None:
+    """Leaves the real screen beside the virtual one if they differ, and a picture of where they do."""
+    real_path = stem.with_suffix(".real.png")
+    virtual_path = stem.with_suffix(".virtual.png")
+    difference_path = stem.with_suffix(".difference.png")
+    difference_path.unlink(missing_ok=True)
+    picture.write_png(real_path, real)
+    if (real.width, real.height) != (virtual.width, virtual.height):
+        raise Difference(
+            f"the real screen is {real.width}x{real.height}, the virtual one {virtual.width}x{virtual.height}"
+            f"; see {real_path} and {virtual_path}"
+        )
+    if real.pixels == real.pixels[:3] * (real.width * real.height):
+        raise Difference(f"the real screen is empty: see {real_path}")
+    marked = picture.differing_pixels(real, virtual)
+    if marked:
+        picture.write_png(difference_path, picture.difference(real, marked))
+        y, x = divmod(marked[0], real.width)
+        raise Difference(
+            f"{len(marked)} pixels differ, the first at ({x}, {y}): real {real.at(marked[0])}, "
+            f"virtual {virtual.at(marked[0])}; see {real_path}, {virtual_path} and {difference_path}"
+        )
+
+
+if __name__ == "__main__":
+    sys.exit(main())

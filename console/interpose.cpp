@@ -58,11 +58,11 @@ bool HasPermissions(int flags) { return (flags & O_CREAT) != 0 || (flags & O_TMP
     int function(char const* path, int flags, ...)                                                           \
     {                                                                                                        \
         static constinit Next<OpenFunction> next(symbol);                                                    \
-        if (auto const fd = console::OpenDevice(path, flags)) return *fd;                                    \
         va_list arguments;                                                                                   \
         va_start(arguments, flags);                                                                          \
         mode_t const permissions = HasPermissions(flags) ? va_arg(arguments, mode_t) : 0;                    \
         va_end(arguments);                                                                                   \
+        if (auto const fd = console::OpenDevice(path, flags)) return *fd;                                    \
         return next.Get()(path, flags, permissions);                                                         \
     }
 
@@ -71,11 +71,11 @@ bool HasPermissions(int flags) { return (flags & O_CREAT) != 0 || (flags & O_TMP
     int function(int folder, char const* path, int flags, ...)                                               \
     {                                                                                                        \
         static constinit Next<OpenAtFunction> next(symbol);                                                  \
-        if (auto const fd = console::OpenDevice(path, flags)) return *fd;                                    \
         va_list arguments;                                                                                   \
         va_start(arguments, flags);                                                                          \
         mode_t const permissions = HasPermissions(flags) ? va_arg(arguments, mode_t) : 0;                    \
         va_end(arguments);                                                                                   \
+        if (auto const fd = console::OpenDevice(path, flags)) return *fd;                                    \
         return next.Get()(folder, path, flags, permissions);                                                 \
     }
 

@@ -173,6 +173,9 @@ TEST(Passing, WhatIsNotOurDeviceGoesToTheKernel)
     int waiting = 0;
     EXPECT_EQ(ioctl(readEnd.Get(), FIONREAD, &waiting), 0);
     EXPECT_EQ(waiting, 3);
+    void* const anonymous = mmap(nullptr, 8, PROT_READ, MAP_PRIVATE | MAP_ANONYMOUS, 9999, 0);
+    EXPECT_NE(anonymous, MAP_FAILED);
+    EXPECT_EQ(munmap(anonymous, 8), 0);
     EXPECT_EQ(errno, 77) << "nothing has failed";
     fb_var_screeninfo variable{};
     EXPECT_EQ(ioctl(null.Get(), FBIOGET_VSCREENINFO, &variable), -1);

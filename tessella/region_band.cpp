@@ -22,7 +22,8 @@ class RangeBuffer {
 public:
     explicit RangeBuffer(int capacity)
     {
-        if (capacity > kFew) many = std::make_unique_for_overwrite<GrRange[]>(static_cast<std::size_t>(capacity));
+        if (capacity > kFew)
+            many = std::make_unique_for_overwrite<GrRange[]>(static_cast<std::size_t>(capacity));
     }
     GrRange* Items() { return many ? many.get() : few; }
 
@@ -38,8 +39,7 @@ struct Window {
         : first(FirstEndingAfter(band, other.items[0].r1)),
           last(std::max(first, LastStartingBy(band, other.items[other.item_count - 1].r2 - 1) + 1)),
           buffer(last - first + other.item_count)
-    {
-    }
+    {}
 
     int first, last;
     RangeBuffer buffer;
@@ -47,8 +47,8 @@ struct Window {
 
 /// `result` = `band` with the ranges `first` to `last` - 1 replaced by `made`, and the capacity of `band` raised
 /// to give room for `peak` ranges.
-void Splice(
-    Band& result, Band const& band, int first, int last, GrRange const* made, std::ptrdiff_t madeCount, int peak)
+void Splice(Band& result, Band const& band, int first, int last, GrRange const* made,
+    std::ptrdiff_t madeCount, int peak)
 {
     int const count = static_cast<int>(madeCount);
     int const tail = band.item_count - last;
@@ -56,7 +56,8 @@ void Splice(
         if (peak > result.item_capacity) Resize(result, GrownCapacity(result.item_capacity, peak));
         if (first + count != last) MoveSlots(result.items + first + count, result.items + last, tail);
     } else {
-        int const capacity = GrownCapacity(band.item_count > 0 ? band.item_capacity : result.item_capacity, peak);
+        int const capacity =
+            GrownCapacity(band.item_count > 0 ? band.item_capacity : result.item_capacity, peak);
         if (result.item_capacity < capacity) {
             GrRange* const larger = NewSlots(result, capacity);
             delete[] result.items;
@@ -83,7 +84,7 @@ bool SpansMeet(Band const& a, Band const& b)
 void AssignUnion(Band& result, Band const& band, Band const& other)
 {
     if (other.item_count <= 0) {
-        if (&result != &band) result = band;
+        if (&result != &band) Assign(result, band);
         return;
     }
     Window window(band, other);
@@ -122,7 +123,7 @@ void AssignUnion(Band& result, Band const& band, Band const& other)
 void AssignDifference(Band& result, Band const& band, Band const& other)
 {
     if (band.item_count <= 0 || other.item_count <= 0 || !SpansMeet(band, other)) {
-        if (&result != &band) result = band;
+        if (&result != &band) Assign(result, band);
         return;
     }
     Window window(band, other);
@@ -163,7 +164,7 @@ void AssignDifference(Band& result, Band const& band, Band const& other)
 void AssignIntersection(Band& result, Band const& band, Band const& other)
 {
     if (band.item_count <= 0) {
-        if (&result != &band) result = band;
+        if (&result != &band) Assign(result, band);
         return;
     }
     if (other.item_count <= 0 || !SpansMeet(band, other)) {
@@ -242,17 +243,8 @@ void Band::Offset(int dx)
 
 Band& Band::operator=(Band const& other)
 {
-    if (other.item_count > 0) {
-        Resize(*this, other.item_capacity);
-        MoveSlots(items, other.items, other.item_count);
-    }
-    item_count = other.item_count;
-    r1 = other.r1;
-    r2 = other.r2;
+    Assign(*this, other);
     return *this;
 }
 
-bool Band::operator==(Band const& other) const
-{
-    return item_count == other.item_count && std::equal(items, items + item_count, other.items);
-}
+bool Band::operator==(Band const& other) const { return SameRanges(*this, other); }

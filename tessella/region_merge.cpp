@@ -31,13 +31,31 @@ using Band = GrRegion::Band;
 
 namespace {
 
-Band const* EndOf(GrItemArray<Band> const& bands) { return bands.items + bands.item_count; }
+/// The operand of the operators that take a rectangle: one band with one range, or none.
+class SingleRegion {
+public:
+    SingleRegion()
+    {
+        Allocate(region.bands, 1);
+        Allocate(region.bands.items[0], 1);
+    }
 
-/// False if one list ends before the other begins. Empty bands count.
-bool ExtentsMeet(GrItemArray<Band> const& a, GrItemArray<Band> const& b)
-{
-    return b.items[0].r1 < EndOf(a)[-1].r2 && EndOf(b)[-1].r2 > a.items[0].r1;
-}
+    GrItemArray<Band> const& Load(GrRect const& rect)
+    {
+        Band& band = region.bands.items[0];
+        region.bands.item_count = rect.IsEmpty() ? 0 : 1;
+        band.item_count = 1;
+        band.r1 = rect.y1;
+        band.r2 = rect.y2;
+        band.items[0] = {rect.x1, rect.x2};
+        return region.bands;
+    }
+
+private:
+    GrRegion region;
+};
+
+SingleRegion rectRegion;
 
 /// Appends the bands behind the last one, none of them joined; one that would begin above its end is shortened.
 void Append(GrItemArray<Band>& bands, Band const* src, Band const* srcEnd)
@@ -46,26 +64,21 @@ void Append(GrItemArray<Band>& bands, Band const* src, Band const* srcEnd)
     if (need > bands.item_capacity) Resize(bands, GrownCapacity(bands.item_capacity, need));
     for (; src != srcEnd; ++src) {
         Band& added = bands.items[bands.item_count++];
-        added = *src;
+        Assign(added, *src);
         added.r1 = std::max(added.r1, (&added)[-1].r2);
     }
 }
 
-}
-
-GrRegion& GrRegion::operator+=(GrRegion const& other)
+void Unite(GrRegion& region, GrItemArray<Band> const& other)
 {
-    if (&other == this || !other) return *this;
-    if (!*this) return *this = other;
-
-    Band const* src = other.bands.items;
-    Band const* const srcEnd = EndOf(other.bands);
+    Band const* src = other.items;
+    Band const* const srcEnd = EndOf(other);
     bool whole = true;  // no part of src has been merged yet
     {
-        BandRewriter list(bands, FirstEndingAfter(bands, src->r1));
+        BandRewriter list(region.bands, FirstEndingAfter(region.bands, src->r1));
         while (src != srcEnd && !list.AtEnd()) {
             if (src->r2 <= list.Next().r1) {
-                list.OpenSlot(srcEnd - src) = *src;
+                Assign(list.OpenSlot(srcEnd - src), *src);
                 list.Commit();
                 if (src->r2 < list.Next().r1) {
                     Band& gap = list.OpenSlot(srcEnd - src);
@@ -80,17 +93,17 @@ GrRegion& GrRegion::operator+=(GrRegion const& other)
             GR_ASSERT_TEXT(src->r1 <= list.Next().r2, "src_from->r1 <= dst_from->r2");
             if (whole && src->r1 < list.Next().r1) {
                 Band& above = list.OpenSlot(srcEnd - src);
-                above = *src;
+                Assign(above, *src);
                 above.r2 = list.Next().r1;
                 list.Commit();
             } else if (whole && src->r1 > list.Next().r1) {
                 Band& above = list.OpenSlot(srcEnd - src);
-                above = list.Next();
+                Assign(above, list.Next());
                 above.r2 = list.Next().r1 = src->r1;
                 list.Commit();
             }
             if (src->r2 >= list.Next().r2) {
-                list.Next().AddBand(*src);
+                AssignUnion(list.Next(), list.Next(), *src);
                 whole = src->r2 == list.Next().r2;
                 if (whole) ++src;
                 list.Keep();
@@ -105,24 +118,17 @@ GrRegion& GrRegion::operator+=(GrRegion const& other)
         }
         list.KeepRest();
     }
-    Append(bands, src, srcEnd);
-    GR_ASSERT(VerifyRegion(*this));
-    return *this;
+    Append(region.bands, src, srcEnd);
+    CheckRegion(region);
 }
 
-GrRegion& GrRegion::operator-=(GrRegion const& other)
+void Subtract(GrRegion& region, GrItemArray<Band> const& other)
 {
-    if (!*this || !other) return *this;
-    if (&other == this) {
-        bands.item_count = 0;
-        return *this;
-    }
-    if (!ExtentsMeet(bands, other.bands)) return *this;
-
+    if (!ExtentsMeet(region.bands, other)) return;
+    Band const* src = other.items;
+    Band const* const srcEnd = EndOf(other);
     {
-        Band const* src = other.bands.items;
-        Band const* const srcEnd = EndOf(other.bands);
-        BandRewriter list(bands, FirstEndingAfter(bands, src->r1));
+        BandRewriter list(region.bands, FirstEndingAfter(region.bands, src->r1));
         while (src != srcEnd && !list.AtEnd()) {
             if (src->r2 <= list.Next().r1) {
                 ++src;
@@ -130,7 +136,7 @@ GrRegion& GrRegion::operator-=(GrRegion const& other)
                 list.Keep();
             } else if (list.Next().r1 < src->r1) {
                 Band& above = list.OpenSlot(srcEnd - src);
-                above = list.Next();
+                Assign(above, list.Next());
                 above.r2 = list.Next().r1 = src->r1;
                 list.Commit();
             } else if (src->r2 < list.Next().r2) {
@@ -140,29 +146,26 @@ GrRegion& GrRegion::operator-=(GrRegion const& other)
                 list.Commit();
                 ++src;
             } else {
-                list.Next().RemoveBand(*src);
+                AssignDifference(list.Next(), list.Next(), *src);
                 if (src->r2 == list.Next().r2) ++src;
                 list.Keep();
             }
         }
         list.KeepRest();
     }
-    GR_ASSERT(VerifyRegion(*this));
-    return *this;
+    CheckRegion(region);
 }
 
-GrRegion& GrRegion::operator&=(GrRegion const& other)
+void Intersect(GrRegion& region, GrItemArray<Band> const& other)
 {
-    if (!*this || &other == this) return *this;
-    if (!other || !ExtentsMeet(bands, other.bands)) {
-        bands.item_count = 0;
-        return *this;
+    if (!ExtentsMeet(region.bands, other)) {
+        region.bands.item_count = 0;
+        return;
     }
-
+    Band const* src = other.items;
+    Band const* const srcEnd = EndOf(other);
     {
-        Band const* src = other.bands.items;
-        Band const* const srcEnd = EndOf(other.bands);
-        BandRewriter list(bands, FirstEndingAfter(bands, src->r1));
+        BandRewriter list(region.bands, FirstEndingAfter(region.bands, src->r1));
         list.DropWritten();
         if (!list.AtEnd()) list.Next().r1 = std::max(list.Next().r1, src->r1);
         while (src != srcEnd && !list.AtEnd()) {
@@ -174,7 +177,7 @@ GrRegion& GrRegion::operator&=(GrRegion const& other)
                 between.r2 = list.Next().r1 = src->r1;
                 list.Commit();
             } else if (src->r2 >= list.Next().r2) {
-                list.Next().IntersectBand(*src);
+                AssignIntersection(list.Next(), list.Next(), *src);
                 if (src->r2 == list.Next().r2) ++src;
                 list.Keep();
             } else {
@@ -186,6 +189,60 @@ GrRegion& GrRegion::operator&=(GrRegion const& other)
             }
         }
     }
-    GR_ASSERT(VerifyRegion(*this));
+    CheckRegion(region);
+}
+
+}
+
+GrRegion& GrRegion::operator+=(GrRegion const& other)
+{
+    if (&other == this || !HasRanges(other.bands)) return *this;
+    if (!HasRanges(bands)) return *this = other;
+    Unite(*this, other.bands);
+    return *this;
+}
+
+GrRegion& GrRegion::operator+=(GrRect const& rect)
+{
+    if (rect.IsEmpty()) return *this;
+    if (!HasRanges(bands)) return *this = rect;
+    Unite(*this, rectRegion.Load(rect));
+    return *this;
+}
+
+GrRegion& GrRegion::operator-=(GrRegion const& other)
+{
+    if (!HasRanges(bands) || !HasRanges(other.bands)) return *this;
+    if (&other == this) {
+        bands.item_count = 0;
+        return *this;
+    }
+    Subtract(*this, other.bands);
+    return *this;
+}
+
+GrRegion& GrRegion::operator-=(GrRect const& rect)
+{
+    if (rect.IsEmpty() || !HasRanges(bands)) return *this;
+    Subtract(*this, rectRegion.Load(rect));
+    return *this;
+}
+
+GrRegion& GrRegion::operator&=(GrRegion const& other)
+{
+    if (!HasRanges(bands) || &other == this) return *this;
+    if (HasRanges(other.bands))
+        Intersect(*this, other.bands);
+    else
+        bands.item_count = 0;
+    return *this;
+}
+
+GrRegion& GrRegion::operator&=(GrRect const& rect)
+{
+    if (rect.IsEmpty())
+        bands.item_count = 0;
+    else if (HasRanges(bands))
+        Intersect(*this, rectRegion.Load(rect));
     return *this;
 }

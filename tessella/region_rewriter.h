@@ -20,8 +20,7 @@ public:
     BandRewriter(GrItemArray<Band>& bands, int index)
         : list(bands), begin(bands.items), to(begin + index), from(to), end(begin + bands.item_count),
           capacity(bands.item_capacity)
-    {
-    }
+    {}
     BandRewriter(BandRewriter const&) = delete;
     BandRewriter& operator=(BandRewriter const&) = delete;
 
@@ -57,7 +56,7 @@ public:
     /// wherever it lies: that is how a vertical hole between equal bands is filled.
     void Commit()
     {
-        if (to != begin && *to == to[-1]) {
+        if (to != begin && SameRanges(*to, to[-1])) {
             to[-1].r2 = to->r2;
         } else {
             ++to;
@@ -80,7 +79,8 @@ public:
         while (from != end) {
             Band const* last = from;
             if (to == begin) ++last;
-            for (Band const* above = last == from ? to - 1 : from; last != end && !(*last == *above); ++last)
+            for (Band const* above = last == from ? to - 1 : from; last != end && !SameRanges(*last, *above);
+                 ++last)
                 above = last;
             MoveRun(last - from);
             if (from != end) Keep();
@@ -92,6 +92,7 @@ private:
     class SavedSlots {
     public:
         static constexpr int kMost = 16;
+        static constexpr int kFew = 8;  // up to so many bands move faster one by one
         void Save(Band const* slots, int count) { std::memcpy(bytes, slots, Size(count)); }
         /// Puts `count` of the saved slots, from slot `first` on, to `slots`.
         void Restore(Band* slots, int first, int count) const
@@ -100,7 +101,10 @@ private:
         }
 
     private:
-        static constexpr std::size_t Size(int count) { return static_cast<std::size_t>(count) * sizeof(Band); }
+        static constexpr std::size_t Size(int count)
+        {
+            return static_cast<std::size_t>(count) * sizeof(Band);
+        }
         alignas(Band) unsigned char bytes[kMost * sizeof(Band)];
     };
 
@@ -111,7 +115,7 @@ private:
         SavedSlots saved;
         if (spares == 0) {
             if (to != from) MoveSlots(to, from, count);
-        } else if (count > 1 && spares <= SavedSlots::kMost) {
+        } else if (count > SavedSlots::kFew && spares <= SavedSlots::kMost) {
             int const turn = static_cast<int>(count % spares);
             saved.Save(to, spares);
             MoveSlots(to, from, count);
@@ -144,7 +148,7 @@ private:
     void SwapWithSpares(std::ptrdiff_t unread, int free)
     {
         SavedSlots saved;
-        if (free <= SavedSlots::kMost) {
+        if (unread > SavedSlots::kFew && free <= SavedSlots::kMost) {
             int const turn = static_cast<int>(unread % free);
             saved.Save(end, free);
             MoveSlots(from + free, from, unread);

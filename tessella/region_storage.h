@@ -25,7 +25,11 @@ constexpr int GrownCapacity(int capacity, int need)
 template <typename T>
 void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
 {
-    if (count > 0) std::memmove(static_cast<void*>(to), from, static_cast<std::size_t>(count) * sizeof(T));
+    if (count == 1)
+        std::memcpy(
+            static_cast<void*>(to), from, sizeof(T));  // most often; a call would cost more than the move
+    else if (count > 1)
+        std::memmove(static_cast<void*>(to), from, static_cast<std::size_t>(count) * sizeof(T));
 }
 
 /// Makes the slots bands that own nothing.
@@ -107,6 +111,51 @@ T const* Locate(GrItemArray<T> const& list, int v)
     return slot >= 0 && v < list.items[slot].r2 ? &list.items[slot] : nullptr;
 }
 
+inline GrRegion::Band const* EndOf(GrItemArray<GrRegion::Band> const& bands)
+{
+    return bands.items + bands.item_count;
+}
+
+/// The first band with ranges, or the list's end.
+inline GrRegion::Band const* FirstWithRanges(GrItemArray<GrRegion::Band> const& bands)
+{
+    GrRegion::Band const* band = bands.items;
+    while (band != EndOf(bands) && band->item_count == 0)
+        ++band;
+    return band;
+}
+
+inline bool HasRanges(GrItemArray<GrRegion::Band> const& bands)
+{
+    return FirstWithRanges(bands) != EndOf(bands);
+}
+
+/// False if one list ends before the other begins. Empty bands count; neither list is empty.
+inline bool ExtentsMeet(GrItemArray<GrRegion::Band> const& a, GrItemArray<GrRegion::Band> const& b)
+{
+    return b.items[0].r1 < EndOf(a)[-1].r2 && EndOf(b)[-1].r2 > a.items[0].r1;
+}
+
+/// `result` = `band`: the ranges, the capacity that they have there, and the extent.
+inline void Assign(GrRegion::Band& result, GrRegion::Band const& band)
+{
+    if (band.item_count > 0) {
+        Resize(result, band.item_capacity);
+        MoveSlots(result.items, band.items, band.item_count);
+    }
+    result.item_count = band.item_count;
+    result.r1 = band.r1;
+    result.r2 = band.r2;
+}
+
+inline bool SameRanges(GrRegion::Band const& a, GrRegion::Band const& b)
+{
+    if (a.item_count != b.item_count) return false;
+    if (a.item_count == 0) return true;
+    return a.items[0] == b.items[0] &&
+        std::memcmp(a.items, b.items, static_cast<std::size_t>(a.item_count) * sizeof(GrRange)) == 0;
+}
+
 /// `result` = `band`, followed by `AddBand`, `RemoveBand` or `IntersectBand` with `other`: the ranges and the
 /// capacity come out as if done in these two steps. `result` may be `band` itself. A band without ranges stays
 /// without under the latter two.
@@ -116,3 +165,6 @@ void AssignIntersection(GrRegion::Band& result, GrRegion::Band const& band, GrRe
 
 /// False if the list of bands is out of order. Reports what it finds in detail, damaged ranges included.
 bool VerifyRegion(GrRegion const& region);
+
+/// Asserts the above. Whatever changes a region's bands ends with it.
+void CheckRegion(GrRegion const& region);

@@ -23,14 +23,27 @@ void GrGenericContextBase<S>::DrawPixel(int x, int y)
 template <typename S>
 void GrGenericContextBase<S>::FillRegion(GrRegion const& region)
 {
-    GrRegion local(region);
-    local.Offset(this->originX, this->originY);
-    local &= this->clip;
+    LocalRegion const moved, cut;
+    GrRegion& local = cut.Get();
+    if (this->originX == 0 && this->originY == 0) {
+        CutRegion(local, region, this->clip);
+    } else {
+        moved.Get() = region;
+        moved.Get().Offset(this->originX, this->originY);
+        CutRegion(local, moved.Get(), this->clip);
+    }
     typename S::Guard const guard(local);
     if (!this->HasPixels()) return;
+    bool const solid = this->IsSolid();
     for (auto const& band : BandsOf(local)) {
         unsigned char* const top = this->RowAddress(band.r1);
         for (auto const& range : RangesOf(band)) {
+            if (solid) {
+                this->FillRows({this->PixelAddress(top, range.r1), this->Stride(), range.r2 - range.r1,
+                                   band.r2 - band.r1},
+                    this->foreColor);
+                continue;
+            }
             unsigned char* row = top;
             for (int y = band.r1; y < band.r2; ++y, row += this->Stride())
                 this->PatternSpan(row, range.r1, range.r2 - range.r1, this->pattern[y & 7],

@@ -3,6 +3,7 @@
 #include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/colors.h>
 #include <tessella/pixel/generic_surface.h>
+#include <tessella/region_cut.h>
 
 /// The drawing operations that move pixel values converted once, when the colour was set. `S` is the surface
 /// layer: where the pixels lie, and how wide they are.

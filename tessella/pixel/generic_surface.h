@@ -24,12 +24,18 @@ public:
     using Base::Base;
 
 protected:
-    using Surface::FillPixels;
+    using Surface::FillRows;
     using Surface::ReadPixel;
     using Surface::WritePixel;
 
     unsigned char* RowAddress(int y) const { return this->PixelBase() + y * this->Stride(); }
     static unsigned char* PixelAddress(unsigned char* row, int x) { return row + std::ptrdiff_t{x} * kBytes; }
+
+    /// Fills `count` pixels from `address` on.
+    static void FillPixels(unsigned char* address, Pixel pixel, int count)
+    {
+        FillRows({address, 0, count, 1}, pixel);
+    }
 
     void PatternPixel(
         unsigned char* row, int x, std::uint8_t patternByte, bool transparent, std::uint32_t mode) const;
@@ -37,6 +43,9 @@ protected:
     /// Paints `count` pixels of a row from column `x` on; `count` is at least 1.
     void PatternSpan(unsigned char* row, int x, int count, std::uint8_t patternByte, bool transparent,
         std::uint32_t mode) const;
+
+    /// True if painting is filling with the fore colour, whatever the row.
+    bool IsSolid() const;
 
     /// Paints `count` pixels downward from `x`, `y` with the context's pattern in the two given pixels. The
     /// raster mode is not looked at: callers that invert do so themselves.
@@ -50,13 +59,6 @@ protected:
     Pixel foreColor = 0;
     Pixel backColor = kAllBits;
     std::uint32_t rasterMode = GrRasterModeCopy;
-
-private:
-    static void InvertBytes(unsigned char* address, std::ptrdiff_t count)
-    {
-        for (std::ptrdiff_t i = 0; i < count; ++i)
-            address[i] = static_cast<unsigned char>(~address[i]);
-    }
 };
 
 #include <tessella/pixel/generic_surface.inl>

@@ -7,7 +7,7 @@ void GrGenericSurface<Base, Surface>::PatternPixel(
     if (mode == GrRasterModeCopy)
         WritePixel(row, x, set ? foreColor : backColor);
     else
-        InvertBytes(PixelAddress(row, x), kBytes);
+        InvertRows({PixelAddress(row, x), 0, 1, 1}, kBytes);
 }
 
 template <typename Base, GrSurfacePolicy Surface>
@@ -15,7 +15,7 @@ void GrGenericSurface<Base, Surface>::PatternSpan(unsigned char* row, int x, int
     std::uint8_t patternByte, bool transparent, std::uint32_t mode) const
 {
     if (mode != GrRasterModeCopy && (!transparent || patternByte == 0xFF)) {
-        InvertBytes(PixelAddress(row, x), std::ptrdiff_t{count} * kBytes);
+        InvertRows({PixelAddress(row, x), 0, count, 1}, kBytes);
     } else if (mode == GrRasterModeCopy && patternByte == 0xFF) {
         FillPixels(PixelAddress(row, x), foreColor, count);
     } else if (mode == GrRasterModeCopy && patternByte == 0) {
@@ -26,6 +26,14 @@ void GrGenericSurface<Base, Surface>::PatternSpan(unsigned char* row, int x, int
             PatternPixel(row, x, patternByte, transparent, mode);
         } while (++x != end);
     }
+}
+
+template <typename Base, GrSurfacePolicy Surface>
+bool GrGenericSurface<Base, Surface>::IsSolid() const
+{
+    std::uint64_t rows;
+    std::memcpy(&rows, this->pattern, sizeof rows);
+    return rasterMode == GrRasterModeCopy && rows == ~std::uint64_t{0};
 }
 
 template <typename Base, GrSurfacePolicy Surface>

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <tessella/pixel/fill_rows.h>
+
 #include <concepts>
 #include <cstdint>
 #include <cstring>
@@ -8,8 +10,8 @@
 /// is, and neither where the row lies nor what the pixel means. Pixels go through `memcpy`, since nothing
 /// promises that rows are aligned; it compiles to plain loads and stores.
 
-/// What a surface owes to the layers above: its pixel type, bytes a pixel, the pixel with all bits set, and
-/// reading and writing. `address` in `FillPixels` is that of the first pixel.
+/// What a surface owes to the layers above: its pixel type, bytes a pixel, the pixel with all bits set, reading
+/// and writing one pixel, and filling a rectangle.
 template <typename Surface>
 concept GrSurfacePolicy = std::unsigned_integral<typename Surface::Pixel> &&
     std::same_as<decltype(Surface::kBytes), int const> &&
@@ -18,7 +20,7 @@ concept GrSurfacePolicy = std::unsigned_integral<typename Surface::Pixel> &&
 {
     pixel = Surface::ReadPixel(source, x);
     Surface::WritePixel(row, x, pixel);
-    Surface::FillPixels(row, pixel, x);
+    Surface::FillRows(GrRows{row, 0, x, 1}, pixel);
 };
 
 struct GrSurface8 {
@@ -28,10 +30,7 @@ struct GrSurface8 {
 
     static Pixel ReadPixel(unsigned char const* row, int x) { return row[x]; }
     static void WritePixel(unsigned char* row, int x, Pixel pixel) { row[x] = pixel; }
-    static void FillPixels(unsigned char* address, Pixel pixel, int count)
-    {
-        std::memset(address, pixel, static_cast<unsigned>(count));
-    }
+    static void FillRows(GrRows const& rows, Pixel pixel) { FillRows8(rows, pixel); }
 };
 
 struct GrSurface16 {
@@ -49,11 +48,7 @@ struct GrSurface16 {
     {
         std::memcpy(row + std::ptrdiff_t{x} * kBytes, &pixel, kBytes);
     }
-    static void FillPixels(unsigned char* address, Pixel pixel, int count)
-    {
-        for (int x = 0; x < count; ++x)
-            WritePixel(address, x, pixel);
-    }
+    static void FillRows(GrRows const& rows, Pixel pixel) { FillRows16(rows, pixel); }
 };
 
 /// Three bytes a pixel, held in 32 bits with the top byte 0. Only the pixel's own three bytes are touched:
@@ -72,11 +67,7 @@ struct GrSurface24 {
     {
         std::memcpy(row + std::ptrdiff_t{x} * kBytes, &pixel, kBytes);
     }
-    static void FillPixels(unsigned char* address, Pixel pixel, int count)
-    {
-        for (int x = 0; x < count; ++x)
-            WritePixel(address, x, pixel);
-    }
+    static void FillRows(GrRows const& rows, Pixel pixel) { FillRows24(rows, pixel); }
 };
 
 struct GrSurface32 {
@@ -94,11 +85,7 @@ struct GrSurface32 {
     {
         std::memcpy(row + std::ptrdiff_t{x} * kBytes, &pixel, kBytes);
     }
-    static void FillPixels(unsigned char* address, Pixel pixel, int count)
-    {
-        for (int x = 0; x < count; ++x)
-            WritePixel(address, x, pixel);
-    }
+    static void FillRows(GrRows const& rows, Pixel pixel) { FillRows32(rows, pixel); }
 };
 
 static_assert(GrSurfacePolicy<GrSurface8> && GrSurfacePolicy<GrSurface16> && GrSurfacePolicy<GrSurface24> &&

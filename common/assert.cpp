@@ -1,8 +1,8 @@
-#include "common/assert.h"
+#include <common/assert.h>
 
-#include "common/assert_settings.h"
-#include "common/library_path.h"
-#include "common/stack_walk.h"
+#include <common/assert_settings.h>
+#include <common/library_path.h>
+#include <common/stack_walk.h>
 
 #include <array>
 #include <cerrno>
@@ -11,7 +11,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
-#include <memory>
 #include <unistd.h>
 
 AssertEventSink assertEventSink = nullptr;
@@ -38,6 +37,18 @@ void WriteToLog(AssertSettings const& settings, char const* text)
     std::fprintf(stream, "%s\n", text);
     std::fflush(stream);  // abort() may follow, and would lose it
 }
+
+/// Reporting comes between a failed call and whoever looks at its error number.
+class KeepErrno {
+public:
+    KeepErrno() : number(errno) {}
+    ~KeepErrno() { errno = number; }
+    KeepErrno(KeepErrno const&) = delete;
+    KeepErrno& operator=(KeepErrno const&) = delete;
+
+private:
+    int number;
+};
 
 void SendToSink(AssertEventSink sink, char const* text) { sink(5, 0, 27, text); }
 
@@ -112,11 +123,11 @@ bool DebuggerAttached()
 [[gnu::noinline]] int ReportFailure(
     char const* expression, char const* /*file*/, unsigned /*line*/, char const* text)
 {
+    KeepErrno const keepErrno;
     AssertSettings const& settings = Settings();
     std::uint64_t const flags = settings.flags;
     if (flags == AssertOff) return 0;
 
-    int const callersErrno = errno;
     AssertEventSink const sink = (flags & AssertEvent) != 0 ? assertEventSink : nullptr;
     if (text != nullptr) {
         if ((flags & AssertLog) != 0) WriteToLog(settings, text);
@@ -131,7 +142,6 @@ bool DebuggerAttached()
         if (DebuggerAttached()) std::raise(SIGTRAP);
     }
     if ((flags & AssertAbort) != 0) std::abort();
-    errno = callersErrno;
     return 1;
 }
 
@@ -145,6 +155,7 @@ bool DebuggerAttached()
 
 [[gnu::noinline]] int AssertErrno(int error, char const* file, unsigned line, char const* function)
 {
+    KeepErrno const keepErrno;
     char const* const path = GetLibraryPath();
     char const* const slash = std::strrchr(path, '/');
     std::array<char, 256> buffer;

@@ -1,7 +1,8 @@
-#include "common/assert_settings.h"
+#include <common/assert_settings.h>
 
-#include <charconv>
+#include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <fcntl.h>
 #include <optional>
 #include <string_view>
@@ -34,15 +35,14 @@ AssertFlags FlagOf(std::string_view text)
     return AssertOff;
 }
 
-/// The prefix is looked for anywhere, but two characters are left out at the start: "10x4" is no number.
-std::optional<std::uint64_t> ReadNumber(std::string_view value)
+/// Hexadecimal, as strtoull reads it. The prefix is looked for anywhere, but it is two characters at the start
+/// that are left out: "10x4" is no number, "zz0x4" is one.
+std::optional<std::uint64_t> ReadNumber(char const* value)
 {
-    if (value.find("0x") != std::string_view::npos || value.find("0X") != std::string_view::npos)
-        value.remove_prefix(2);
-    std::uint64_t number = 0;
-    char const* const end = value.data() + value.size();
-    auto const [stop, error] = std::from_chars(value.data(), end, number, 16);
-    if (error != std::errc{} || stop != end || number == 0) return std::nullopt;
+    if (std::strstr(value, "0x") || std::strstr(value, "0X")) value += 2;
+    char* end = nullptr;
+    std::uint64_t const number = std::strtoull(value, &end, 16);
+    if (*end != 0 || number == 0) return std::nullopt;
     return number;
 }
 

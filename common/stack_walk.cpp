@@ -1,4 +1,4 @@
-#include "common/stack_walk.h"
+#include <common/stack_walk.h>
 
 #include <algorithm>
 #include <array>

@@ -11,5 +11,6 @@ extern std::recursive_mutex grabMutex;
 extern pthread_mutex_t eventMutex;
 extern pthread_cond_t eventCond;
 
+/// Make and destroy the two, before the input threads start and after they have ended.
 void CreateEventWait();
 void DestroyEventWait();

@@ -50,6 +50,7 @@ void MapFramebuffer()
 void UnmapFramebuffer()
 {
     if (GrScreen.fbMemory && GrScreen.fbMemory != MAP_FAILED) munmap(GrScreen.fbMemory, GrScreen.fbLength);
+    GrScreen.fbMemory = nullptr;
 }
 
 /// A driver that refuses the map shows other colours; there is nothing more to be done about it.
@@ -82,7 +83,6 @@ bool GrSetVideoMode(unsigned& width, unsigned& height, unsigned& depth, unsigned
     if (initialized) {
         DeleteScreenContext();
         UnmapFramebuffer();
-        GrScreen.fbMemory = nullptr;
     }
 
     fb_fix_screeninfo fixed{};

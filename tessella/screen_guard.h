@@ -11,11 +11,13 @@
 extern std::recursive_mutex screenMutex;
 
 /// Above 0, nobody may draw or move the cursor on the screen. It rests at 1 while the pointer is not in use;
-/// guards then take no lock at all, as there is no cursor to protect. Under `screenMutex` but for that.
+/// guards then take no lock at all, as there is no cursor to protect. Not per thread.
 extern std::atomic<std::uint32_t> hideCount;
 
 /// The bracket around all drawing on the framebuffer, for the pixels of a region or rectangle in screen
-/// coordinates. Guards nest on one thread, with any regions; a nested one costs one counter step.
+/// coordinates, which may be empty. Guards nest on one thread, with any regions; a nested one costs one counter
+/// step. Left on every way out, exceptions included. Threads of the application take turns by `grabMutex`, not by
+/// this.
 class GrScreenGuard {
 public:
     explicit GrScreenGuard(GrRegion const& region);

@@ -10,8 +10,7 @@
 
 #include <cstdio>
 
-// What a failed start leaves behind is left on purpose: `GrDone` has nothing to do then, and there is no second
-// try in one process.
+// What a failed start leaves open is left on purpose: `GrDone` has nothing to do then.
 bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
 {
     if (initialized) return false;

@@ -1,5 +1,5 @@
 #include <tessella/session_state.h>
 
 bool initialized = false;
-bool screenVisible = false;
+constinit std::atomic<bool> screenVisible{false};
 pthread_t sessionThread;

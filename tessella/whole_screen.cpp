@@ -2,6 +2,8 @@
 
 #include <tessella/screen.h>
 
+constinit GrScreenRecord GrScreen;
+
 GrRegion WholeScreen()
 {
     return GrRect{0, 0, static_cast<int>(GrScreen.width), static_cast<int>(GrScreen.height)};

@@ -17,8 +17,8 @@ enum : std::uint32_t { GrRasterModeCopy = 4 };
 /// Nothing is ever painted outside the clip region, and drawing reports nothing: where the clip is empty,
 /// nothing happens. A context does not own the pixels that it draws on, which must outlive it.
 ///
-/// A context is used by one thread at a time. Contexts of the screen serialise their access to it with the
-/// input threads by themselves.
+/// A context is used by one thread at a time. Contexts of the screen keep clear of the library's own input
+/// threads by themselves; threads of the application take turns.
 ///
 /// The operations are declared in the order of their table, which is part of the library's interface.
 class GR_API GrContext {

@@ -28,7 +28,7 @@ public:
     unsigned char* pixels;      ///< rows from the top, without padding between them; owned; may be null
     unsigned char* alphaPlane;  ///< one byte a pixel; owned; may be null
 
-    /// An image of black pixels in the screen's format, or in true colour if `flags` say so. The alpha plane,
+    /// An image of black pixels in the screen's format as it is now, or in true colour if `flags` say so. The alpha plane,
     /// if asked for, is not initialised. Without a positive width and height there is neither.
     GrImage(int width, int height, std::uint32_t flags);
 

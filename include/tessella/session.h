@@ -3,32 +3,40 @@
 #include <tessella/export.h>
 
 /// Starts the session: opens the framebuffer device, maps its memory in the mode that the kernel's driver
-/// has, and clears the screen. There is one session a process, and it cannot be started again once it has
-/// ended. The calling thread becomes the application's thread.
+/// has, and clears the screen. In 8-bit modes it loads a colour map. The mode itself is never changed.
 ///
-/// `width`, `height` and `depth` are results only: they receive the size in pixels and the colour depth. The
-/// library never changes the mode. `mode` is ignored.
+/// The calling thread becomes the application's thread: it holds the library from now on, and the functions
+/// below are for it alone unless they say otherwise. SIGUSR1 gets a handler that does nothing, and keeps it.
 ///
-/// False if the session is started already, if there is no framebuffer device, or if its mode cannot be
-/// learned or is not supported; in the last two cases the reason stands on the standard error stream. The
-/// references then keep their values.
+/// `width`, `height` and `depth` are results only: they receive the size in pixels and the colour depth.
+/// `mode` is ignored.
+///
+/// False, with the references unchanged, if a session is started or has ended in this process, if there is no
+/// framebuffer device, or if its mode cannot be learned or is not supported. In the last two cases, and after
+/// the end of a session, the reason stands on the standard error stream, the device stays open, and `GrDone`
+/// does nothing. Memory that cannot be mapped is told there too, but is no failure: nothing is painted then.
 GR_API bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode);
 
-/// Ends the session: clears the screen and gives everything back. Does nothing if there is none. Called on the
-/// application's thread.
+/// Ends the session: clears the screen, unmaps and closes the framebuffer. Does nothing if there is no
+/// session. Called on the thread that started it. Contexts of the screen may still be deleted, and draw
+/// nothing; `GrScreen` keeps what it held, but for the context and the memory.
 GR_API void GrDone();
 
-/// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it; contexts of the screen made
-/// before must not be used any more. References and `mode` as for `GrInit`. False on failure, with
-/// the reason on the standard error stream; the session is then without a context until a later call succeeds.
-/// Called on the application's thread.
+/// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it. Contexts of the screen, and
+/// images in the screen's format, that were made before must not be used any more. References and `mode` are as
+/// for `GrInit`.
+///
+/// False on failure, with the references unchanged and the reason on the standard error stream. The session
+/// is then without a context, and nothing may be drawn, on images of the screen's format either, until a later
+/// call succeeds. It fails before a session and after it.
 GR_API bool GrChangeMode(unsigned& width, unsigned& height, unsigned& depth, unsigned mode);
 
-/// Whether the monitor can be asked about itself; always false.
+/// Whether the monitor can be asked about itself; always false. Any thread.
 GR_API bool GrIsDdcSupport();
 
-/// Whether the monitor can show a mode at the given refresh rate; always false, since no mode is ever set.
+/// Whether the monitor can show a mode of `width` by `height` pixels at `rate` hertz; always false, since no
+/// mode is ever set. Any thread.
 GR_API bool GrIsRefreshRateValid(unsigned width, unsigned height, unsigned rate);
 
-/// Sounds the console's bell. Any thread.
+/// Sounds the console's bell, through the standard output stream. Any thread.
 GR_API void GrBeep();

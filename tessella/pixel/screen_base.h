@@ -22,7 +22,7 @@ protected:
 };
 
 /// Contexts over the mapped framebuffer. They hold no address: base and stride are read from `GrScreen` at each
-/// use, since the mapping may be made anew while a context lives.
+/// use, since the mapping can go, with the session or for a new mode, while a context lives.
 class GrScreenContextBase : public GrContextBase<GrScreenContextState> {
 protected:
     using GrContextBase::GrContextBase;

@@ -1,7 +1,7 @@
-#include "common/assert.h"
+#include <common/assert.h>
 
 #include "assert_child.h"
-#include "common/assert_settings.h"
+#include <common/assert_settings.h>
 
 #include <array>
 #include <cerrno>
@@ -77,10 +77,10 @@ TEST(AssertSettings, AreReadFromNumbersAndWords)
     } const cases[] = {{nullptr, 0x4E}, {"", 0x4E}, {"0x24", 0x24}, {"0X2f", 0x2F}, {"24", 0x24},
         {"add", 0xADD}, {"0x0", kOff}, {"0", kOff}, {"0x", kOff}, {"0x24 ", kOff}, {"0x24g", kOff},
         {"-1", kOff}, {"0xFFFFFFFFFFFFFFFF", kOff}, {"0x1FFFFFFFFFFFFFFFF", kOff}, {"zz24", kOff},
-        {"zz0x24", kOff}, {"10x24", kOff}, {"log 0x24", kOff}, {"break", 0x01}, {"debug", 0x02},
-        {"log", 0x04}, {"event", 0x08}, {"msgbox", 0x10}, {"abort", 0x20}, {"stack", 0x40},
-        {"  log   abort log ", 0x24}, {" ", 0}, {"none", kOff}, {"Log", kOff}, {"log,abort", kOff},
-        {"log none stack", kOff}};
+        {"zz0x24", 0x24}, {" 24", 0x24}, {" 0x24", kOff}, {"10x24", kOff}, {"log 0x24", kOff},
+        {"break", 0x01}, {"debug", 0x02}, {"log", 0x04}, {"event", 0x08}, {"msgbox", 0x10}, {"abort", 0x20},
+        {"stack", 0x40}, {"  log   abort log ", 0x24}, {" ", 0}, {"none", kOff}, {"Log", kOff},
+        {"log,abort", kOff}, {"log none stack", kOff}};
     unsetenv("VELLUM_SAFE_ASSERT_LOGFILE");
     auto const flagsOf = [](char const* value) {
         SetVariable("VELLUM_SAFE_ASSERT", value);
@@ -174,13 +174,18 @@ TEST(AssertReport, TextsAreFormattedAndCut)
     EXPECT_EQ(outcome.status, 0);
 }
 
-TEST(AssertReport, LeavesErrnoAloneWhenTheLogIsFull)
+TEST(AssertReport, LeavesErrnoAlone)
 {
-    ChildOutcome const outcome = RunChild("log", "/dev/full", [] {
-        errno = EDOM;
-        return FailOnce() == 1 && errno == EDOM ? 0 : 1;
-    });
-    EXPECT_EQ(outcome.status, 0);
+    for (char const* const settings : {"log", "none log"})
+        for (char const* const logFile : {"/dev/full", "/nowhere/at/all"}) {
+            ChildOutcome const outcome = RunChild(settings, logFile, [] {
+                errno = EDOM;
+                AssertErrno(ENOENT, "part", 7, nullptr);
+                FailOnce();
+                return errno == EDOM ? 0 : 1;
+            });
+            EXPECT_EQ(outcome.status, 0) << settings << ' ' << logFile;
+        }
 }
 
 TEST(AssertReport, StackStartsAtTheFailingPlace)

@@ -1,4 +1,4 @@
-#include "common/library_path.h"
+#include <common/library_path.h>
 
 #include <cstdio>
 

@@ -1,7 +1,7 @@
-#include "common/stack_walk.h"
+#include <common/stack_walk.h>
 
 #include "assert_child.h"
-#include "common/library_path.h"
+#include <common/library_path.h>
 
 #include <array>
 #include <gtest/gtest.h>

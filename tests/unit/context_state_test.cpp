@@ -154,8 +154,8 @@ TEST(VideoMode, IsFoundByBitsFirstAndColourBitsThen)
         EXPECT_EQ(mode->depth, c.depth);
         EXPECT_EQ(mode->bytesPerPixel, c.bytes);
     }
-    for (auto const& c :
-        {Case{24, 16, 0, 0}, Case{32, 30, 0, 0}, Case{15, 15, 0, 0}, Case{16, 12, 0, 0}, Case{1, 3, 0, 0}})
+    for (auto const& c : {Case{4, 24, 0, 0}, Case{24, 16, 0, 0}, Case{32, 30, 0, 0}, Case{32, 32, 0, 0},
+             Case{16, 24, 0, 0}, Case{15, 15, 0, 0}, Case{16, 12, 0, 0}, Case{1, 3, 0, 0}})
         EXPECT_EQ(FindVideoMode(c.bits, c.colorBits), nullptr) << c.bits << ' ' << c.colorBits;
 }
 

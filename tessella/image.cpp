@@ -72,7 +72,7 @@ GrContext* GrImage::GetContext() const
 {
     // The image stays as it is: what a context draws on are the pixels that it points to.
     auto* const image = const_cast<GrImage*>(this);
-    if (flags & GrImageTrueColor)
+    if (isTrueColor())
         return flags & GrImagePremultiplied ? CreateImageContext<GrSurface32, GrColorsRGBA>(image)
                                             : CreateImageContext<GrSurface32, GrColorsRGB>(image);
 

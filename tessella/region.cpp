@@ -1,3 +1,4 @@
+#include <tessella/coordinates.h>
 #include <tessella/region_storage.h>
 
 using Band = GrRegion::Band;
@@ -49,8 +50,8 @@ void GrRegion::Offset(int dx, int dy)
     if (dx == 0 && dy == 0) return;
     for (int i = 0; i < bands.item_count; ++i) {
         Band& band = bands.items[i];
-        band.r1 += dy;
-        band.r2 += dy;
+        band.r1 = Moved(band.r1, dy);
+        band.r2 = Moved(band.r2, dy);
         if (dx != 0) band.Offset(dx);
     }
 }

@@ -1,3 +1,4 @@
+#include <tessella/coordinates.h>
 #include <tessella/region_storage.h>
 
 #include <memory>
@@ -236,8 +237,8 @@ void Band::GetFullRange(GrRange& range) const
 void Band::Offset(int dx)
 {
     for (int i = 0; i < item_count; ++i) {
-        items[i].r1 += dx;
-        items[i].r2 += dx;
+        items[i].r1 = Moved(items[i].r1, dx);
+        items[i].r2 = Moved(items[i].r2, dx);
     }
 }
 

@@ -87,6 +87,29 @@ void Cut(GrRegion& result, GrItemArray<Band> const& region, GrItemArray<Band> co
     GR_ASSERT_TEXT(VerifyRegion(result), "VerifyRegion(*this)");
 }
 
+bool IsOneRectangle(GrItemArray<Band> const& bands)
+{
+    return bands.item_count == 1 && bands.items[0].item_count == 1;
+}
+
+/// The case of windows and clips without a shape, which most drawing meets: a rectangle cut out of one.
+void CutRectangle(GrRegion& result, Band const& band, GrRect const& rect)
+{
+    int const x1 = std::max(band.items[0].r1, rect.x1);
+    int const x2 = std::min(band.items[0].r2, rect.x2);
+    int const y1 = std::max(band.r1, rect.y1);
+    int const y2 = std::min(band.r2, rect.y2);
+    result.bands.item_count = 0;
+    if (x1 >= x2 || y1 >= y2) return;
+    Reserve(result.bands, 1);
+    Band& cut = result.bands.items[0];
+    Reserve(cut, 1);
+    cut.r1 = y1;
+    cut.r2 = y2;
+    cut.items[0] = {x1, x2};
+    cut.item_count = result.bands.item_count = 1;
+}
+
 void CutList(GrRegion& result, GrRegion const& region, GrItemArray<Band> const& other)
 {
     if (!region || !ExtentsMeet(region.bands, other))
@@ -99,60 +122,49 @@ void CutList(GrRegion& result, GrRegion const& region, GrItemArray<Band> const& 
 
 void CutRegion(GrRegion& result, GrRegion const& region, GrRegion const& other)
 {
-    if (other)
+    if (IsOneRectangle(region.bands) && IsOneRectangle(other.bands)) {
+        Band const& band = other.bands.items[0];
+        CutRectangle(result, region.bands.items[0], {band.items[0].r1, band.r1, band.items[0].r2, band.r2});
+    } else if (other) {
         CutList(result, region, other.bands);
-    else
+    } else {
         result.bands.item_count = 0;
+    }
 }
 
 void CutRegion(GrRegion& result, GrRegion const& region, GrRect const& rect)
 {
-    if (rect.IsEmpty()) {
+    if (IsOneRectangle(region.bands)) {
+        CutRectangle(result, region.bands.items[0], rect);
+    } else if (rect.IsEmpty()) {
         result.bands.item_count = 0;
-        return;
+    } else {
+        GrRange range{rect.x1, rect.x2};
+        Band band;
+        band.r1 = rect.y1;
+        band.r2 = rect.y2;
+        band.items = &range;
+        band.item_count = band.item_capacity = 1;
+        CutList(result, region, {&band, 1, 1});
     }
-    GrRange range{rect.x1, rect.x2};
-    Band band;
-    band.r1 = rect.y1;
-    band.r2 = rect.y2;
-    band.items = &range;
-    band.item_count = band.item_capacity = 1;
-    CutList(result, region, {&band, 1, 1});
 }
-
-struct LocalRegion::Scratch {
-    GrRegion region;
-    Scratch* next = nullptr;
-};
 
 /// Returns the thread's regions when it ends. Static objects that draw after that get new ones.
 struct LocalRegion::Release {
     ~Release()
     {
         while (unused) {
-            Scratch* const scratch = unused;
-            unused = scratch->next;
-            delete scratch;
+            Scratch* const first = unused;
+            unused = first->next;
+            delete first;
         }
     }
 };
 
 constinit thread_local LocalRegion::Scratch* LocalRegion::unused = nullptr;
 
-LocalRegion::LocalRegion() : scratch(unused)
+LocalRegion::Scratch* LocalRegion::NewScratch()
 {
-    if (scratch) {
-        unused = scratch->next;
-        return;
-    }
     thread_local Release const release;
-    scratch = new Scratch;
+    return new Scratch;
 }
-
-LocalRegion::~LocalRegion()
-{
-    scratch->next = unused;
-    unused = scratch;
-}
-
-GrRegion& LocalRegion::Get() const { return scratch->region; }

@@ -21,8 +21,8 @@
 //   - A union that has taken part of `src` already (it reached beyond the band it met) merges the rest into the
 //     bands that follow, but no longer adds rows between them; and what is left above the next band comes as a
 //     whole, so that bands can overlap.
-//   - An intersection ends rows that meet no band of the other region with the next of its bands, which is empty
-//     unless a hole lies before it.
+//   - An intersection cuts rows that meet no band of the other region with that region's next band below: an empty
+//     one, unless they lie in a hole without a band.
 //
 // Bands, counts and recorded capacities, also those of spare slots, are exactly what merging slot by slot leaves;
 // BandRewriter and the merges of bands keep that account while moving blocks.

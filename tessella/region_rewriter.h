@@ -93,7 +93,10 @@ private:
     public:
         static constexpr int kMost = 16;
         static constexpr int kFew = 8;  // up to so many bands move faster one by one
-        void Save(Band const* slots, int count) { std::memcpy(bytes, slots, Size(count)); }
+        void Save(Band const* slots, int count)
+        {
+            std::memcpy(bytes, static_cast<void const*>(slots), Size(count));
+        }
         /// Puts `count` of the saved slots, from slot `first` on, to `slots`.
         void Restore(Band* slots, int first, int count) const
         {

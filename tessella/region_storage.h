@@ -25,11 +25,13 @@ constexpr int GrownCapacity(int capacity, int need)
 template <typename T>
 void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
 {
+    if (count <= 0) return;
+    void const* const source = from;
     if (count == 1)
         std::memcpy(
-            static_cast<void*>(to), from, sizeof(T));  // most often; a call would cost more than the move
-    else if (count > 1)
-        std::memmove(static_cast<void*>(to), from, static_cast<std::size_t>(count) * sizeof(T));
+            static_cast<void*>(to), source, sizeof(T));  // most often; a call costs more than the move
+    else
+        std::memmove(static_cast<void*>(to), source, static_cast<std::size_t>(count) * sizeof(T));
 }
 
 /// Makes the slots bands that own nothing.
@@ -162,6 +164,12 @@ inline bool SameRanges(GrRegion::Band const& a, GrRegion::Band const& b)
 void AssignUnion(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
 void AssignDifference(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
 void AssignIntersection(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
+
+/// The first band that is empty, begins above its predecessor (which begins at `above`), or has a range that is
+/// empty or begins before its predecessor ends; `end` if there is none. The second form needs wide registers.
+GrRegion::Band const* FirstImperfectPlain(GrRegion::Band const* band, GrRegion::Band const* end, int above);
+GrRegion::Band const* FirstImperfectWide(GrRegion::Band const* band, GrRegion::Band const* end, int above);
+bool WideRegistersPresent();
 
 /// False if the list of bands is out of order. Reports what it finds in detail, damaged ranges included.
 bool VerifyRegion(GrRegion const& region);

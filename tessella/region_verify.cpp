@@ -12,11 +12,7 @@
 
 using Band = GrRegion::Band;
 
-namespace {
-
-/// The first band that is empty, begins above its predecessor (which begins at `above`), or has a range that is
-/// empty or begins before its predecessor ends. `end` if there is none.
-[[gnu::target("default")]] Band const* FirstImperfect(Band const* band, Band const* end, int above)
+Band const* FirstImperfectPlain(Band const* band, Band const* end, int above)
 {
     for (; band != end; ++band) {
         if (band->r1 < above || band->r1 >= band->r2) return band;
@@ -32,32 +28,46 @@ namespace {
 }
 
 #ifdef __x86_64__
-/// The same with 16 ends at a time, each but the last compared with the one after it.
-[[gnu::target("avx512f"), maybe_unused]] Band const* FirstImperfect(
-    Band const* band, Band const* end, int above)
+/// Ends that are compared at a time, each with the one after it; even, so that an r1 comes first.
+static constexpr int kPairs = 14;
+
+/// Of `pairs` ends, at most 14, those that are not before the one after them. All 14 if `pairs` is -1.
+[[gnu::target("avx512f,bmi2")]] inline static unsigned WrongPairs(int const* ends, int pairs)
 {
-    constexpr int kStep = 14;  // even, so that an r1 comes first each time
-    static constexpr int kNoEnds[2] = {};
     __m512i const mayTouch = _mm512_set1_epi64(1LL << 32);  // an r2 may equal the r1 after it
+    auto const ofPairs = static_cast<__mmask16>(_bzhi_u32((1U << kPairs) - 1, static_cast<unsigned>(pairs)));
+    auto const ofEnds = static_cast<__mmask16>(2 * ofPairs + 1);
+    __m512i const here = _mm512_maskz_loadu_epi32(ofEnds, ends);
+    __m512i const next = _mm512_maskz_alignr_epi32(ofPairs, here, here, 1);
+    return _mm512_mask_cmple_epi32_mask(ofPairs, next, _mm512_sub_epi32(here, mayTouch));
+}
+
+[[gnu::target("avx512f,bmi2")]] Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
+{
+    static constexpr int kPerfect[kPairs + 1] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14};
     for (; band != end; ++band) {
-        int pairs = std::max(2 * band->item_count - 1, 0);
-        int const* ends = pairs > 0 ? &band->items->r1 : kNoEnds;
-        unsigned disorder = band->r1 < above || band->r1 >= band->r2;
+        if (band->r1 < above || band->r1 >= band->r2) return band;
         above = band->r1;
-        do {
-            auto const ofPairs = static_cast<__mmask16>((1U << std::min(pairs, kStep)) - 1);
-            auto const ofEnds = static_cast<__mmask16>(2 * ofPairs + 1);
-            __m512i const here = _mm512_maskz_loadu_epi32(ofEnds, ends);
-            __m512i const next = _mm512_alignr_epi32(here, here, 1);
-            disorder |= _mm512_mask_cmple_epi32_mask(ofPairs, next, _mm512_sub_epi32(here, mayTouch));
-            pairs -= kStep;
-            ends += kStep;
-        } while (pairs > 0);
-        if (disorder != 0) return band;
+        int const* ends = band->item_count > 0 ? &band->items->r1 : kPerfect;
+        int pairs = 2 * band->item_count - 1;
+        for (; pairs > kPairs; pairs -= kPairs, ends += kPairs)
+            if (WrongPairs(ends, kPairs) != 0) return band;
+        if (WrongPairs(ends, pairs) != 0) return band;
     }
     return end;
 }
+
+bool WideRegistersPresent() { return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("bmi2"); }
+#else
+Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
+{
+    return FirstImperfectPlain(band, end, above);
+}
+
+bool WideRegistersPresent() { return false; }
 #endif
+
+namespace {
 
 /// False, and reported, if a range ends before it begins or begins before its predecessor does. A predecessor
 /// that begins at 0 is not compared.
@@ -78,9 +88,10 @@ bool VerifyBand(Band const& band)
 bool VerifyRegion(GrRegion const& region)
 {
     Band const* const end = EndOf(region.bands);
+    auto* const firstImperfect = WideRegistersPresent() ? FirstImperfectWide : FirstImperfectPlain;
     int previous = std::numeric_limits<int>::min();
     for (Band const* item = region.bands.items; item != end; ++item) {
-        item = FirstImperfect(item, end, previous);
+        item = firstImperfect(item, end, previous);
         if (item == end) break;
         previous = item == region.bands.items ? 0 : item[-1].r1;
         if (item->r1 >= item->r2) return GR_ASSERT_TEXT(false, "false");

@@ -15,10 +15,13 @@ enum : std::uint32_t { GrRasterModeCopy = 4 };
 /// A context has a clip region, an origin, two colours, an 8 by 8 pattern and a raster mode. All operations
 /// take context coordinates; the surface coordinate of a point is its context coordinate plus the origin.
 /// Nothing is ever painted outside the clip region, and drawing reports nothing: where the clip is empty,
-/// nothing happens. A context does not own the pixels that it draws on, which must outlive it.
+/// nothing happens. If memory runs out, `std::bad_alloc` leaves the operation and the context stays usable.
 ///
-/// A context is used by one thread at a time. Contexts of the screen keep clear of the library's own input
-/// threads by themselves; threads of the application take turns.
+/// Whoever made a context deletes it. It does not own the pixels that it draws on, which must outlive it, and
+/// the region that it is limited to must lie on them: nothing checks that.
+///
+/// Contexts are for one thread at a time, whichever surface they draw on. Those of the screen keep clear of the
+/// library's own input threads by themselves.
 ///
 /// The operations are declared in the order of their table, which is part of the library's interface.
 class GR_API GrContext {
@@ -39,7 +42,8 @@ public:
     virtual void ExcludeClipRegion(GrRegion const& region) = 0;
     /// Makes the clip as large as the context's limit again.
     virtual void ResetClipRegion() = 0;
-    /// Writes the smallest rectangle around the clip, in context coordinates, into `rect`.
+    /// Writes the smallest rectangle around the clip, in context coordinates, into `rect`; around an empty clip,
+    /// the empty rectangle at surface point (0, 0).
     virtual void GetClipRect(GrRect& rect) = 0;
 
     /// Puts context point (0, 0) at `x`, `y` from the context's base origin.
@@ -53,7 +57,7 @@ public:
     virtual void SetForeColor(GrColor color) = 0;
 
     /// Chooses the pattern, copied from eight bytes, one a row, bit 0 being the leftmost pixel. It is anchored
-    /// to the surface, not to the origin, and moved by `dx` to the right and `dy` downward. A clear bit paints
+    /// to the surface, not to the origin, and moved by `dx` to the right and `dy` downward, of any sign. A clear bit paints
     /// the back colour, or nothing if `transparent` is set. A new context's pattern is all ones.
     virtual void SetPattern(std::uint8_t const bits[8], int dx, int dy, bool transparent) = 0;
 
@@ -62,15 +66,16 @@ public:
     /// The value last set; `GrRasterModeCopy` in a new context.
     virtual std::uint32_t GetRasterMode() = 0;
 
-    /// The colour of one pixel; 0 outside the clip.
+    /// The colour of one pixel; 0 outside the clip, as is a black pixel inside it, and where there are no pixels.
+    /// Only true-colour images give an alpha value.
     virtual GrColor GetPixel(int x, int y) = 0;
     /// Paints one pixel through pattern and raster mode.
     virtual void DrawPixel(int x, int y) = 0;
     /// Paints a region through pattern and raster mode.
     virtual void FillRegion(GrRegion const& region) = 0;
 
-    /// Copies the rectangle `dst` from `source`, whose point `sx`, `sy` goes to its top left corner. Contexts
-    /// that cannot do so do nothing.
+    /// Does nothing, unless the context can copy from another: then it fills the rectangle `dst` from `source`,
+    /// whose point `sx`, `sy`, in its own context coordinates, goes to the top left corner.
     virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);
 };
 
@@ -79,6 +84,7 @@ class GR_API GrContextI : public GrContext {
 public:
     /// Puts both the base origin and the origin at surface point `x`, `y`.
     virtual void SetBaseOrigin(int x, int y) = 0;
-    /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it.
+    /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it. It must lie
+    /// within the image: nothing checks that.
     virtual void SetLimitRegion(GrRegion const& region) = 0;
 };

@@ -7,7 +7,7 @@ GrColor const GrColors4::palette[16] = {
 };
 // clang-format on
 
-GrColors4::Pixel GrColors4::colorCube[512];
+std::atomic<GrColors4::Pixel> GrColors4::colorCube[512];
 
 namespace {
 
@@ -38,7 +38,8 @@ int NearestPaletteIndex(GrColor color)
 void GrColors4::BuildColorCube()
 {
     // Each cell stands for its low corner, not its centre: the bias towards dark is wanted.
-    for (unsigned i = 0; i < 512; ++i)
-        colorCube[i] = static_cast<Pixel>(
-            NearestPaletteIndex((i & 7) * 32 | (i >> 3 & 7) * 32 << 8 | (i >> 6 & 7) * 32 << 16));
+    for (unsigned i = 0; i < 512; ++i) {
+        GrColor const corner = (i & 7) * 32 | (i >> 3 & 7) * 32 << 8 | (i >> 6 & 7) * 32 << 16;
+        colorCube[i].store(static_cast<Pixel>(NearestPaletteIndex(corner)), std::memory_order_relaxed);
+    }
 }

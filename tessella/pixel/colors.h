@@ -2,6 +2,7 @@
 
 #include <tessella/color.h>
 
+#include <atomic>
 #include <concepts>
 #include <cstdint>
 
@@ -25,15 +26,15 @@ struct GrColors4 {
 
     static GrColor const palette[16];
 
-    /// The nearest palette index for 3 bits a channel; zero until `BuildColorCube` has run.
-    static Pixel colorCube[512];
-
-    /// Fills `colorCube`. Every run writes the same values, so it takes no lock.
+    /// The nearest palette index for 3 bits a channel; zero until `BuildColorCube` has run. Every run writes the
+    /// same values, so there is no lock.
+    static std::atomic<Pixel> colorCube[512];
     static void BuildColorCube();
 
     static Pixel ToPixel(GrColor c)
     {
-        return colorCube[(GrRed(c) >> 5) | (GrGreen(c) >> 5) << 3 | (GrBlue(c) >> 5) << 6];
+        return colorCube[(GrRed(c) >> 5) | (GrGreen(c) >> 5) << 3 | (GrBlue(c) >> 5) << 6].load(
+            std::memory_order_relaxed);
     }
 
     // Inverting gives pixels above 15; they read as their low four bits.

@@ -2,8 +2,8 @@
 
 #include <tessella/context.h>
 
-/// The clip, origin and pattern operations, alike for contexts over images and over the screen. `State` derives
-/// from the context's interface and declares the fields, in its own order.
+/// The clip, origin and pattern operations, alike for contexts over images and over the screen. `State`
+/// derives from the context's interface and declares the fields, in its own order.
 template <typename State>
 class GrContextBase : public State {
 public:
@@ -18,13 +18,6 @@ public:
 
 protected:
     using State::State;
-
-    /// `rect` moved from context to surface coordinates.
-    GrRect OnSurface(GrRect const& rect) const
-    {
-        return {rect.x1 + this->originX, rect.y1 + this->originY, rect.x2 + this->originX,
-            rect.y2 + this->originY};
-    }
 };
 
 #include <tessella/pixel/context_base.inl>

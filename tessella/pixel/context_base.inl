@@ -1,3 +1,5 @@
+#include <tessella/coordinates.h>
+
 #include <bit>
 
 template <typename State>
@@ -12,13 +14,13 @@ template <typename State>
 void GrContextBase<State>::GetClipRegion(GrRegion& region)
 {
     region = this->clip;
-    region.Offset(-this->originX, -this->originY);
+    region.Offset(SeenFrom(0, this->originX), SeenFrom(0, this->originY));
 }
 
 template <typename State>
 void GrContextBase<State>::ExcludeClipRect(GrRect const& rect)
 {
-    this->clip -= OnSurface(rect);
+    this->clip -= Moved(rect, this->originX, this->originY);
 }
 
 template <typename State>
@@ -38,15 +40,15 @@ void GrContextBase<State>::ResetClipRegion()
 template <typename State>
 void GrContextBase<State>::SetOrigin(int x, int y)
 {
-    this->originX = this->baseOriginX + x;
-    this->originY = this->baseOriginY + y;
+    this->originX = Moved(this->baseOriginX, x);
+    this->originY = Moved(this->baseOriginY, y);
 }
 
 template <typename State>
 void GrContextBase<State>::GetOrigin(int& x, int& y)
 {
-    x = this->originX - this->baseOriginX;
-    y = this->originY - this->baseOriginY;
+    x = SeenFrom(this->originX, this->baseOriginX);
+    y = SeenFrom(this->originY, this->baseOriginY);
 }
 
 template <typename State>

@@ -2,17 +2,15 @@ template <typename S>
 void GrGenericContextBase<S>::GetClipRect(GrRect& rect)
 {
     this->clip.GetOuterRect(rect);
-    rect.x1 -= this->originX;
-    rect.y1 -= this->originY;
-    rect.x2 -= this->originX;
-    rect.y2 -= this->originY;
+    rect = {SeenFrom(rect.x1, this->originX), SeenFrom(rect.y1, this->originY),
+        SeenFrom(rect.x2, this->originX), SeenFrom(rect.y2, this->originY)};
 }
 
 template <typename S>
 void GrGenericContextBase<S>::DrawPixel(int x, int y)
 {
-    x += this->originX;
-    y += this->originY;
+    x = Moved(x, this->originX);
+    y = Moved(y, this->originY);
     if (!this->clip.Contains(x, y)) return;
     typename S::Guard const guard(GrRect{x, y, x + 1, y + 1});
     if (!this->HasPixels()) return;
@@ -55,8 +53,8 @@ void GrGenericContextBase<S>::FillRegion(GrRegion const& region)
 template <typename S, GrColorsPolicy Colors>
 GrColor GrGenericContext<S, Colors>::GetPixel(int x, int y)
 {
-    x += this->originX;
-    y += this->originY;
+    x = Moved(x, this->originX);
+    y = Moved(y, this->originY);
     if (!this->clip.Contains(x, y)) return 0;
     typename S::Guard const guard(GrRect{x, y, x + 1, y + 1});
     if (!this->HasPixels()) return 0;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <tessella/coordinates.h>
 #include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/colors.h>
 #include <tessella/pixel/generic_surface.h>

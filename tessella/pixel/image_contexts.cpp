@@ -5,22 +5,16 @@
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 GrImageContext<Surface, Colors>::GrImageContext(GrImage const& image)
     : GrGenericContext<GrGenericSurface<GrImageContextBase<Surface::kBytes>, Surface>, Colors>(image)
-{}
-
-template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
-void GrImageContext<Surface, Colors>::AllocateDitherRows()
 {
-    if (this->width > 0)
-        this->ditherRows = std::make_unique<std::int32_t[]>(static_cast<std::size_t>(this->width) * 3);
+    if (Colors::kDithers && image.width > 0)
+        this->ditherRows = std::make_unique<std::int32_t[]>(static_cast<std::size_t>(image.width) * 3);
 }
 
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 GrContext* CreateImageContext(GrImage* image)
 {
     if constexpr (std::is_same_v<Colors, GrColors4>) GrColors4::BuildColorCube();
-    auto context = std::make_unique<GrImageContext<Surface, Colors>>(*image);
-    if constexpr (Colors::kDithers) context->AllocateDitherRows();
-    return context.release();
+    return new GrImageContext<Surface, Colors>(*image);
 }
 
 template GrContext* CreateImageContext<GrSurface8, GrColors4>(GrImage* image);

@@ -3,15 +3,13 @@
 #include <tessella/pixel/generic_context.h>
 #include <tessella/pixel/image_base.h>
 
-/// The context over an image in memory; it adds nothing but its making.
+/// The context over an image in memory; it adds nothing but its making. In the formats that dither it brings
+/// error rows.
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 class GrImageContext final
     : public GrGenericContext<GrGenericSurface<GrImageContextBase<Surface::kBytes>, Surface>, Colors> {
 public:
     explicit GrImageContext(GrImage const& image);
-
-    /// Gives a context of a format that dithers its error rows.
-    void AllocateDitherRows();
 };
 
 /// A new context over `image`, with what its format needs for converting. The caller deletes it, before the

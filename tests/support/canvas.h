@@ -40,10 +40,19 @@ public:
         });
     }
     void ResetClipRegion() { clip = limit; }
+    void SetLimit(GrRegion const& region)
+    {
+        ForEachPixel([&](int x, int y, std::size_t i) { limit[i] = clip[i] = region.Contains(x, y); });
+    }
+    void SetBaseOrigin(int x, int y)
+    {
+        baseX = originX = x;
+        baseY = originY = y;
+    }
     void SetOrigin(int x, int y)
     {
-        originX = x;
-        originY = y;
+        originX = baseX + x;
+        originY = baseY + y;
     }
     void SetForeColor(GrColor color) { fore = format.toPixel(color); }
     void SetBackColor(GrColor color) { back = format.toPixel(color); }
@@ -99,6 +108,7 @@ private:
     Format format;
     int width, height, stride;
     std::vector<bool> limit, clip;
+    int baseX = 0, baseY = 0;
     int originX = 0, originY = 0;
     std::uint32_t fore = 0, back;
     bool pattern[8][8] = {{1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1},

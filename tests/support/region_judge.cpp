@@ -1,198 +1,17 @@
-#include "support/region_judge.h"
+#include <support/region_judge_steps.h>
 
 #include <algorithm>
-#include <utility>
 
 namespace judge {
 
 namespace {
 
-using Band = GrRegion::Band;
-
 std::vector<std::string> reports;
-
-bool Report(bool condition, char const* text)
-{
-    if (!condition) reports.emplace_back(text);
-    return condition;
-}
-
-// Single slots.
-
-void Copy(GrRange& to, GrRange const& from) { to = from; }
-
-/// Bytewise: storage and all.
-void Copy(Band& to, Band const& from)
-{
-    to.r1 = from.r1;
-    to.r2 = from.r2;
-    to.items = from.items;
-    to.item_count = from.item_count;
-    to.item_capacity = from.item_capacity;
-}
-
-void Swap(Band& a, Band& b)
-{
-    std::swap(a.r1, b.r1);
-    std::swap(a.r2, b.r2);
-    std::swap(a.items, b.items);
-    std::swap(a.item_count, b.item_count);
-    std::swap(a.item_capacity, b.item_capacity);
-}
-
-// Storage.
-
-template <typename T>
-T* NewArray(int n)
-{
-    return new T[static_cast<std::size_t>(n)]();
-}
-
-template <typename T>
-void Allocate(GrItemArray<T>& list, int n)
-{
-    list.item_capacity = n;
-    Report(list.items == nullptr, "items==0");
-    list.items = NewArray<T>(n);
-    list.item_count = 0;
-}
-
-template <typename T>
-void Resize(GrItemArray<T>& list, int n)
-{
-    if (list.item_capacity < n) {
-        T* const items = NewArray<T>(n);
-        for (int i = 0; i < list.item_capacity; ++i)
-            Copy(items[i], list.items[i]);
-        delete[] list.items;
-        list.items = items;
-    }
-    list.item_capacity = n;
-}
-
-template <typename T>
-int FirstEndingAfter(GrItemArray<T> const& list, int v)
-{
-    int lo = 0;
-    int hi = list.item_count;
-    while (lo < hi) {
-        int const mid = (lo + hi) / 2;
-        if (v >= list.items[mid].r2)
-            lo = mid + 1;
-        else
-            hi = mid;
-    }
-    return lo;
-}
-
-int LocateItem(Band const& band, int v, int& slot, int lo, int hi)
-{
-    if (band.item_count < 1) return slot = -1;
-    while (lo < hi) {
-        int const mid = (lo + hi + 1) / 2;
-        if (v < band.items[mid].r1)
-            hi = mid - 1;
-        else
-            lo = mid;
-    }
-    slot = lo;
-    return lo != -1 && v < band.items[lo].r2 ? lo : -1;
-}
-
-void InsertItemAfter(Band& band, int i)
-{
-    int const need = band.item_count > i ? band.item_count + 1 : i + 2;
-    if (need > band.item_capacity) {
-        int capacity = band.item_capacity;
-        while (need > capacity)
-            capacity += 10;
-        Resize(band, capacity);
-    }
-    for (int k = band.item_count; k > i + 1; --k)
-        band.items[k] = band.items[k - 1];
-    band.item_count = need;
-}
-
-void RemoveItems(Band& band, int from, int to)
-{
-    int const tail = band.item_count - to - 1;
-    for (int k = 0; k < tail; ++k)
-        band.items[from + k] = band.items[to + 1 + k];
-    band.item_count = tail + from;
-}
-
-void AssignBand(Band& band, Band const& other)
-{
-    if (other.item_count > 0) {
-        Resize(band, other.item_capacity);
-        for (int i = 0; i < other.item_count; ++i)
-            band.items[i] = other.items[i];
-    }
-    band.item_count = other.item_count;
-    band.r1 = other.r1;
-    band.r2 = other.r2;
-}
 
 bool SameRanges(Band const& a, Band const& b)
 {
     return a.item_count == b.item_count && std::equal(a.items, a.items + a.item_count, b.items);
 }
-
-/// The two cursors of a merge in place.
-template <typename T>
-struct Cursors {
-    Cursors(GrItemArray<T>& items, int index) : list(items), begin(items.items), from(begin + index), to(from) {}
-
-    GrItemArray<T>& list;
-    T* begin;
-    T* from;
-    T* to;
-
-    bool Unread() const { return from - begin < list.item_count; }
-
-    void ShiftTail(GrRange* end, int free) const
-    {
-        for (GrRange* k = end; k-- != from;)
-            k[free] = *k;
-    }
-    void ShiftTail(Band* end, int free) const
-    {
-        for (Band* k = end; k-- != from;)
-            Swap(*k, k[free]);
-    }
-
-    void OpenGap()
-    {
-        Report(from == to, "from==to");
-        int const free = list.item_capacity - list.item_count;
-        if (free > 0) {
-            ShiftTail(begin + list.item_count, free);
-            from += free;
-        } else {
-            list.item_capacity += 10;
-            T* const fresh = NewArray<T>(list.item_capacity);
-            int const written = static_cast<int>(to - begin);
-            int const count = list.item_count;
-            for (int i = 0; i < written; ++i)
-                Copy(fresh[i], begin[i]);
-            for (int i = written; i < count; ++i)
-                Copy(fresh[i + 10], begin[i]);
-            delete[] begin;
-            list.items = begin = fresh;
-            to = begin + written;
-            from = to + 10;
-        }
-        list.item_count = list.item_capacity;
-    }
-
-    T& Slot()
-    {
-        if (from == to) OpenGap();
-        return *to;
-    }
-
-    void SetCount() { list.item_count = static_cast<int>(to - begin); }
-};
 
 struct BandCursors : Cursors<Band> {
     using Cursors<Band>::Cursors;
@@ -216,17 +35,6 @@ struct BandCursors : Cursors<Band> {
     {
         while (Unread())
             Keep();
-    }
-};
-
-struct RangeCursors : Cursors<GrRange> {
-    using Cursors<GrRange>::Cursors;
-
-    void Keep()
-    {
-        if (to != from) *to = *from;
-        ++to;
-        ++from;
     }
 };
 
@@ -285,116 +93,13 @@ bool ListsApart(GrRegion const& region, GrRegion const& other)
 
 }
 
+bool Report(bool condition, char const* text)
+{
+    if (!condition) reports.emplace_back(text);
+    return condition;
+}
+
 std::vector<std::string> TakeReports() { return std::exchange(reports, {}); }
-
-void AddRange(Band& band, int a, int b)
-{
-    int lo = 0;
-    int hi = 0;
-    int const hit1 = LocateItem(band, a, lo, -1, band.item_count - 1);
-    int const hit2 = LocateItem(band, b - 1, hi, lo, band.item_count - 1);
-    if (hit1 != -1 && hit2 == hit1) return;
-    if (hi == -1) {
-        InsertItemAfter(band, -1);
-        band.items[0] = {a, b};
-        return;
-    }
-    int const end = hit2 != -1 ? band.items[hit2].r2 : b;
-    if (hi != lo) {
-        if (hit1 == -1) ++lo;
-        if (a < band.items[lo].r1) band.items[lo].r1 = a;
-        if (hi > lo) RemoveItems(band, lo + 1, hi);
-    } else if (hit1 == -1) {
-        InsertItemAfter(band, hi);
-        ++lo;
-        band.items[lo].r1 = a;
-    }
-    band.items[lo].r2 = end;
-}
-
-void AddBand(Band& band, Band const& other)
-{
-    for (int i = 0; i < other.item_count; ++i)
-        AddRange(band, other.items[i].r1, other.items[i].r2);
-}
-
-void RemoveBand(Band& band, Band const& other)
-{
-    if (other.item_count == 0) return;
-    if (other.items[other.item_count - 1].r2 <= band.items[0].r1) return;
-    if (other.items[0].r1 >= band.items[band.item_count - 1].r2) return;
-    GrRange const* src = other.items;
-    GrRange const* const srcEnd = src + other.item_count;
-    RangeCursors c(band, FirstEndingAfter(band, src->r1));
-    while (src != srcEnd && c.Unread()) {
-        if (src->r2 <= c.from->r1) {
-            ++src;
-        } else if (src->r1 >= c.from->r2) {
-            c.Keep();
-        } else if (c.from->r1 >= src->r1 && src->r2 >= c.from->r2) {
-            ++c.from;
-        } else if (c.from->r1 >= src->r1) {
-            c.from->r1 = src->r2;
-            ++src;
-        } else if (src->r2 >= c.from->r2) {
-            c.from->r2 = src->r1;
-            c.Keep();
-        } else {
-            GrRange& slot = c.Slot();
-            slot = {c.from->r1, src->r1};
-            ++c.to;
-            c.from->r1 = src->r2;
-            ++src;
-        }
-    }
-    while (c.Unread())
-        c.Keep();
-    c.SetCount();
-}
-
-void IntersectBand(Band& band, Band const& other)
-{
-    if (other.item_count == 0 || other.items[other.item_count - 1].r2 <= band.items[0].r1 ||
-        other.items[0].r1 >= band.items[band.item_count - 1].r2) {
-        band.item_count = 0;
-        return;
-    }
-    GrRange const* src = other.items;
-    GrRange const* const srcEnd = src + other.item_count;
-    RangeCursors c(band, FirstEndingAfter(band, src->r1));
-    c.to = c.begin;
-    int g = std::min(src->r1, c.from->r1);
-    while (src != srcEnd && c.Unread()) {
-        if (src->r1 <= c.from->r1) {
-            g = src->r2;
-            ++src;
-        } else if (g >= c.from->r2) {
-            c.Keep();
-        } else if (g <= c.from->r1 && src->r1 >= c.from->r2) {
-            ++c.from;
-        } else if (g <= c.from->r1) {
-            c.from->r1 = src->r1;
-            g = src->r2;
-            ++src;
-        } else if (src->r1 >= c.from->r2) {
-            c.from->r2 = g;
-            c.Keep();
-        } else {
-            GrRange& slot = c.Slot();
-            slot = {c.from->r1, g};
-            ++c.to;
-            c.from->r1 = src->r1;
-            g = src->r2;
-            ++src;
-        }
-    }
-    while (c.Unread()) {
-        if (g <= c.from->r1) break;
-        if (g <= c.from->r2) c.from->r2 = g;
-        c.Keep();
-    }
-    c.SetCount();
-}
 
 void Assign(GrRegion& region, GrRect const& rect)
 {
@@ -413,7 +118,8 @@ void Assign(GrRegion& region, GrRect const& rect)
 void Assign(GrRegion& region, GrRegion const& other)
 {
     if (&other == &region) return;
-    if (other.bands.item_capacity > region.bands.item_capacity) Resize(region.bands, other.bands.item_capacity);
+    if (other.bands.item_capacity > region.bands.item_capacity)
+        Resize(region.bands, other.bands.item_capacity);
     for (int i = 0; i < other.bands.item_count; ++i)
         AssignBand(region.bands.items[i], other.bands.items[i]);
     region.bands.item_count = other.bands.item_count;

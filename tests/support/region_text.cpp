@@ -1,4 +1,4 @@
-#include "support/region_text.h"
+#include <support/region_text.h>
 
 #include <common/assert.h>
 
@@ -18,7 +18,8 @@ void Collect(int, int, int, char const* text)
     std::string const report = text;
     std::size_t const end = report.find(kModule);
     bool const wellFormed = report.starts_with(kHead) && end != std::string::npos;
-    assertions.push_back(wellFormed ? report.substr(kHead.size(), end - kHead.size()) : "malformed: " + report);
+    assertions.push_back(
+        wellFormed ? report.substr(kHead.size(), end - kHead.size()) : "malformed: " + report);
 }
 
 std::istream& operator>>(std::istream& in, GrRange& range)
@@ -27,7 +28,10 @@ std::istream& operator>>(std::istream& in, GrRange& range)
     return in >> range.r1 >> dot >> dot >> range.r2;
 }
 
-std::ostream& operator<<(std::ostream& out, GrRange const& range) { return out << range.r1 << ".." << range.r2; }
+std::ostream& operator<<(std::ostream& out, GrRange const& range)
+{
+    return out << range.r1 << ".." << range.r2;
+}
 
 template <typename T>
 void Append(GrItemArray<T>& list, T*& slot)
@@ -64,7 +68,8 @@ std::string CapacitiesText(GrRegion const& region)
         --last;
     for (int i = 0; i < last; ++i) {
         GrRegion::Band const& band = region.bands.items[i];
-        out << (i == region.bands.item_count ? " | " : " ") << (band.items == nullptr ? 0 : band.item_capacity);
+        out << (i == region.bands.item_count ? " | " : " ")
+            << (band.items == nullptr ? 0 : band.item_capacity);
     }
     return out.str();
 }

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+
 namespace {
 
 struct Channels {
@@ -73,12 +75,15 @@ TEST(Colors, CubeReadsIndicesOutsideItThroughTheSameArithmetic)
 
 TEST(Colors, SixteenColoursAreFoundThroughTheDarkCornersOfTheCells)
 {
+    // In the order blue, green, red, as a VGA shows its text colours.
+    static constexpr GrColor kVga[16] = {0x000000, 0xAA0000, 0x00AA00, 0xAAAA00, 0x0000AA, 0xAA00AA, 0x0055AA,
+        0xAAAAAA, 0x555555, 0xFF5555, 0x55FF55, 0xFFFF55, 0x5555FF, 0xFF55FF, 0x55FFFF, 0xFFFFFF};
     GrColors4::BuildColorCube();
     EXPECT_EQ(GrColors4::ToPixel(0xFFFFFF), 15);
     EXPECT_EQ(GrColors4::ToPixel(0x1F1F1F), 0);
     for (unsigned index = 0; index < 16; ++index) {
-        EXPECT_EQ(GrColors4::ToPixel(GrColors4::palette[index]), index) << index;
-        EXPECT_EQ(GrColors4::FromPixel(static_cast<std::uint8_t>(0xF0 | index)), GrColors4::palette[index]);
+        EXPECT_EQ(GrColors4::ToPixel(kVga[index]), index) << index;
+        EXPECT_EQ(GrColors4::FromPixel(static_cast<std::uint8_t>(0xF0 | index)), kVga[index]);
     }
     ForManyColors([](Channels c) {
         Channels const corner{c.red & 0xE0, c.green & 0xE0, c.blue & 0xE0, 0};
@@ -103,6 +108,8 @@ TEST(Colors, PremultiplyingShiftsAndDividingSpills)
     EXPECT_EQ(GrColorsRGBA::ToPixel(0xFFFFFFFF), 0xFFFEFEFEu);
     EXPECT_EQ(GrColorsRGBA::FromPixel(0x00123456), 0u);
     EXPECT_EQ(GrColorsRGBA::FromPixel(0x01000002), 0x01000200u) << "2 * 256 / 1 runs into green";
+    EXPECT_EQ(GrColorsRGBA::FromPixel(0x01000200), 0x01020000u) << "green into blue";
+    EXPECT_EQ(GrColorsRGBA::FromPixel(0x01020000), 0x03000000u) << "blue into alpha";
 }
 
 }

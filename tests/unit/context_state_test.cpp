@@ -7,8 +7,15 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <chrono>
+#include <cstring>
+#include <functional>
+#include <future>
+#include <limits>
 #include <memory>
 #include <thread>
+#include <vector>
 
 namespace {
 
@@ -48,6 +55,7 @@ TEST(ContextState, BaseOriginMovesTheOriginAndLimitBoundsTheClip)
     context->GetOrigin(x, y);
     EXPECT_EQ(x, 0);
     EXPECT_EQ(y, 0);
+    context->SetOrigin(9, 9);
     context->SetLimitRegion(GrRect{0, 0, 5, 5});
     context->SetOrigin(1, 1);
     context->GetOrigin(x, y);
@@ -90,6 +98,72 @@ TEST(ContextState, EmptyClipPaintsNothingUntilReset)
     EXPECT_EQ(context->GetPixel(2, 1), 0u);
     context->DrawPixel(1, 1);
     EXPECT_EQ(context->GetPixel(1, 1), 0xABCDEFu);
+}
+
+/// The place of a virtual function in its class's table, as this platform's C++ ABI keeps it in a pointer to it.
+template <typename Pointer>
+std::size_t Slot(Pointer function)
+{
+    std::size_t word;
+    std::memcpy(&word, &function, sizeof word);
+    return (word - 1) / sizeof(void*);
+}
+
+TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
+{
+    std::size_t slot = 2;  // behind the two entries of the destructor
+    for (std::size_t const actual :
+        {Slot(&GrContext::SetClipRegion), Slot(&GrContext::GetClipRegion), Slot(&GrContext::ExcludeClipRect),
+            Slot(&GrContext::ExcludeClipRegion), Slot(&GrContext::ResetClipRegion),
+            Slot(&GrContext::GetClipRect), Slot(&GrContext::SetOrigin), Slot(&GrContext::GetOrigin),
+            Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor), Slot(&GrContext::SetPattern),
+            Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode), Slot(&GrContext::GetPixel),
+            Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion), Slot(&GrContext::CopyFromContext),
+            Slot(&GrContextI::SetBaseOrigin), Slot(&GrContextI::SetLimitRegion)})
+        EXPECT_EQ(actual, slot++);
+}
+
+TEST(ContextState, CoordinatesBeyondTheirRangeAreClippedAway)
+{
+    constexpr int kMin = std::numeric_limits<int>::min(), kMax = std::numeric_limits<int>::max();
+    GrImage const image(4, 4, GrImageTrueColor);
+    auto const context = ImageContext(image);
+    for (int const origin : {3, -3}) {
+        context->ResetClipRegion();
+        context->SetOrigin(origin, origin);
+        context->SetClipRegion(GrRect{kMin, kMin, kMax, kMax});
+        context->SetForeColor(static_cast<GrColor>(100 + origin));
+        context->FillRegion(GrRect{kMin, kMin, kMax, kMax});
+        EXPECT_EQ(context->GetPixel(-origin, -origin), static_cast<GrColor>(100 + origin));
+        context->DrawPixel(kMax, kMin);
+        EXPECT_EQ(context->GetPixel(kMin, kMax), 0u);
+        context->ExcludeClipRect({kMin, kMin, kMax, kMax});
+        EXPECT_EQ(ClipRect(*context), (GrRect{-origin, -origin, -origin, -origin}));
+    }
+    context->SetBaseOrigin(kMin, kMin);
+    context->SetOrigin(-1, -1);
+    int x = 0, y = 0;
+    context->GetOrigin(x, y);
+    EXPECT_EQ(x, 0) << "stopped at the end of the range";
+}
+
+TEST(ContextState, BackPixelHasAllBitsSetAtFirst)
+{
+    struct Case {
+        int bits;
+        std::vector<unsigned char> pixel;
+    };
+    static constexpr std::uint8_t kClear[8] = {};
+    for (auto const& c : {Case{4, {0xFF}}, Case{8, {0xFF}}, Case{15, {0xFF, 0xFF}}, Case{16, {0xFF, 0xFF}},
+             Case{24, {0xFF, 0xFF, 0xFF}}, Case{32, {0xFF, 0xFF, 0xFF, 0xFF}}}) {
+        GrImage image(1, 1, new unsigned char[4](), nullptr, 0);
+        image.bits = c.bits;
+        image.bytes = static_cast<std::int32_t>(c.pixel.size());
+        auto const context = ImageContext(image);
+        context->SetPattern(kClear, 0, 0, false);
+        context->DrawPixel(0, 0);
+        EXPECT_TRUE(std::equal(c.pixel.begin(), c.pixel.end(), image.pixels)) << c.bits;
+    }
 }
 
 TEST(LoadTime, StateStandsBeforeAnySession)
@@ -140,6 +214,38 @@ TEST(ScreenGuard, TakesTheLockOnlyWhileThePointerIsInUse)
         EXPECT_TRUE(FreeForOthers());
     }
     hideCount = 1;
+}
+
+TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
+{
+    std::vector<unsigned char> memory(16 * 16 * 4);
+    GrScreen.fbMemory = memory.data();
+    GrScreen.stride = 64;
+    std::unique_ptr<GrContext> const context(
+        FindVideoMode(32, 24)->createScreenContext(GrRect{0, 0, 16, 16}, 0, 0));
+    struct Case {
+        std::function<void()> draw;
+        bool waits;
+    };
+    hideCount = 0;
+    for (auto const& c : {Case{[&] {
+                                   context->FillRegion(GrRect{2, 2, 4, 4});
+                               },
+                              true},
+             Case{[&] { context->FillRegion(GrRegion()); }, true},
+             Case{[&] { context->DrawPixel(1, 1); }, true}, Case{[&] { context->GetPixel(1, 1); }, true},
+             Case{[&] { context->DrawPixel(16, 1); }, false},
+             Case{[&] { context->GetPixel(1, -1); }, false}}) {
+        screenMutex.lock();
+        auto const drawn = std::async(std::launch::async, c.draw);
+        if (c.waits)
+            EXPECT_EQ(drawn.wait_for(std::chrono::milliseconds(30)), std::future_status::timeout);
+        else
+            drawn.wait();
+        screenMutex.unlock();
+    }
+    hideCount = 1;
+    GrScreen = {};
 }
 
 TEST(VideoMode, IsFoundByBitsFirstAndColourBitsThen)

@@ -10,42 +10,48 @@
 
 namespace {
 
+/// True if an image of the format has a context of the given class.
 template <typename Surface, typename Colors>
-bool Is(std::unique_ptr<GrContext> const& context)
-{
-    return typeid(*context) == typeid(GrImageContext<Surface, Colors>);
-}
-
-std::unique_ptr<GrContext> ContextFor(int bits, int bytes, std::uint32_t flags = 0)
+bool Gives(int bits, int bytes, std::uint32_t flags = 0)
 {
     GrImage image(3, 3, new unsigned char[36](), nullptr, flags);
-    if (!(flags & GrImageTrueColor)) {
+    if (!image.isTrueColor()) {
         image.bits = bits;
         image.bytes = bytes;
     }
-    return std::unique_ptr<GrContext>(image.GetContext());
+    std::unique_ptr<GrContext> const context(image.GetContext());
+    return typeid(*context) == typeid(GrImageContext<Surface, Colors>);
 }
 
 TEST(Image, ContextFollowsTheFormat)
 {
-    EXPECT_TRUE((Is<GrSurface8, GrColors4>(ContextFor(4, 1))));
-    EXPECT_TRUE((Is<GrSurface8, GrColors8>(ContextFor(8, 1))));
-    EXPECT_TRUE((Is<GrSurface16, GrColors15>(ContextFor(15, 2))));
-    EXPECT_TRUE((Is<GrSurface16, GrColors16>(ContextFor(16, 2))));
-    EXPECT_TRUE((Is<GrSurface24, GrColors24>(ContextFor(24, 3))));
-    EXPECT_TRUE((Is<GrSurface32, GrColors24>(ContextFor(32, 4))));
-    EXPECT_TRUE((Is<GrSurface32, GrColorsRGB>(ContextFor(0, 0, GrImageTrueColor))));
-    EXPECT_TRUE((Is<GrSurface32, GrColorsRGBA>(ContextFor(0, 0, GrImageTrueColor | GrImagePremultiplied))));
+    EXPECT_TRUE((Gives<GrSurface8, GrColors4>(4, 1)));
+    EXPECT_TRUE((Gives<GrSurface8, GrColors8>(8, 1)));
+    EXPECT_TRUE((Gives<GrSurface16, GrColors15>(15, 2)));
+    EXPECT_TRUE((Gives<GrSurface16, GrColors16>(16, 2)));
+    EXPECT_TRUE((Gives<GrSurface24, GrColors24>(24, 3)));
+    EXPECT_TRUE((Gives<GrSurface32, GrColors24>(32, 4)));
+    EXPECT_TRUE((Gives<GrSurface32, GrColorsRGB>(0, 0, GrImageTrueColor)));
+    EXPECT_TRUE((Gives<GrSurface32, GrColorsRGBA>(0, 0, GrImageTrueColor | GrImagePremultiplied)));
 
     GrScreen.depth = 24;
     GrScreen.createImageContext = FindVideoMode(32, 24)->createImageContext;
-    EXPECT_TRUE((Is<GrSurface32, GrColors24>(ContextFor(24, 4)))) << "the screen's own format comes first";
+    EXPECT_TRUE((Gives<GrSurface32, GrColors24>(24, 4))) << "the screen's own format comes first";
     GrScreen = {};
 
     testing::internal::CaptureStderr();
-    EXPECT_EQ(ContextFor(0, 0), nullptr);
+    EXPECT_EQ(GrImage(3, 3, 0).GetContext(), nullptr);
     EXPECT_NE(
         testing::internal::GetCapturedStderr().find("Assertion failed: false, file "), std::string::npos);
+}
+
+TEST(Image, SixteenColoursAreLookedUpFromTheFirstContextOn)
+{
+    for (auto& entry : GrColors4::colorCube)
+        entry = 0;
+    EXPECT_EQ(GrColors4::ToPixel(0xFFFFFF), 0);
+    EXPECT_TRUE((Gives<GrSurface8, GrColors4>(4, 1)));
+    EXPECT_EQ(GrColors4::ToPixel(0xFFFFFF), 15);
 }
 
 TEST(Image, TakesTheScreensFormatUnlessTrueColorIsAskedFor)
@@ -79,11 +85,17 @@ TEST(Image, TakesTheScreensFormatUnlessTrueColorIsAskedFor)
     alphaOnly.SetFlags(GrImageOverBack);
     EXPECT_EQ(alphaOnly.flags & (GrImageNoDither | GrImageOverBack), GrImageOverBack + 0u);
 
-    GrImage const nothing(0, 2, GrImageHasAlpha);
-    EXPECT_TRUE(!nothing.pixels && !nothing.alphaPlane);
+    EXPECT_NE(GrImage(3, 2, GrImageAlphaOnly | GrImageTrueColor).pixels, nullptr)
+        << "it goes with alpha only";
+
+    for (auto const& [width, height] : {std::pair{0, 2}, {-1, 2}, {2, -1}}) {
+        GrImage const nothing(width, height, GrImageHasAlpha);
+        EXPECT_TRUE(!nothing.pixels && !nothing.alphaPlane);
+    }
 
     unsigned char pixels[4], alpha[1];
-    GrImage borrowed(1, 1, pixels, alpha, GrImageTrueColor);
+    GrImage borrowed(1, 1, pixels, alpha, GrImageHasAlpha);
+    EXPECT_TRUE(borrowed.isTrueColor() && borrowed.bits == 32 && borrowed.bytes == 4);
     borrowed.Detach();
 }
 

@@ -1,5 +1,5 @@
-#include "support/region_judge.h"
-#include "support/region_text.h"
+#include <support/region_judge.h>
+#include <support/region_text.h>
 
 #include <gtest/gtest.h>
 
@@ -16,10 +16,23 @@
 
 namespace {
 
-enum Kind { AddRect, SubtractRect, IntersectRect, AddRegion, SubtractRegion, IntersectRegion, SetRect, SetRegion, Move, Clear };
-constexpr char const* kKindNames[] = {"AddRect", "SubtractRect", "IntersectRect", "AddRegion", "SubtractRegion",
-    "IntersectRegion", "SetRect", "SetRegion", "Move", "Clear"};
+enum Kind {
+    AddRect,
+    SubtractRect,
+    IntersectRect,
+    AddRegion,
+    SubtractRegion,
+    IntersectRegion,
+    SetRect,
+    SetRegion,
+    Move,
+    Clear
+};
+constexpr char const* kKindNames[] = {"AddRect", "SubtractRect", "IntersectRect", "AddRegion",
+    "SubtractRegion", "IntersectRegion", "SetRect", "SetRegion", "Move", "Clear"};
 constexpr int kRegions = 3;
+constexpr int kMostBands =
+    1000;  // lists with overlapping bands can double with every union: they start again
 
 struct Operation {
     Kind kind;
@@ -35,8 +48,8 @@ std::string Text(Operations const& operations)
 {
     std::ostringstream out;
     for (Operation const& o : operations)
-        out << "    {" << kKindNames[o.kind] << ", " << o.target << ", " << o.other << ", {" << o.rect.x1 << ", "
-            << o.rect.y1 << ", " << o.rect.x2 << ", " << o.rect.y2 << "}},\n";
+        out << "    {" << kKindNames[o.kind] << ", " << o.target << ", " << o.other << ", {" << o.rect.x1
+            << ", " << o.rect.y1 << ", " << o.rect.x2 << ", " << o.rect.y2 << "}},\n";
     return out.str();
 }
 
@@ -88,14 +101,19 @@ std::string Difference(Operations const& operations)
         ByJudge(theirs, o);
         auto const target = static_cast<std::size_t>(o.target);
         auto const state = [target](auto const& regions, auto const& reports) {
-            std::string text = BandsText(regions[target]) + "\n  capacities " + CapacitiesText(regions[target]) + "\n";
+            std::string text =
+                BandsText(regions[target]) + "\n  capacities " + CapacitiesText(regions[target]) + "\n";
             for (std::string const& report : reports)
                 text += "  " + report + "\n";
             return text;
         };
         std::string const we = state(ours, TakeAssertions());
         std::string const they = state(theirs, judge::TakeReports());
-        if (we != they) return "library: " + we + "judge:   " + they;
+        if (we != they) return std::string("library: ").append(we).append("judge:   ").append(they);
+        if (ours[target].bands.item_count > kMostBands) {
+            ours[target].Clear();
+            theirs[target].Clear();
+        }
     }
     return "";
 }
@@ -131,10 +149,12 @@ void ExpectNoFailure(int total, std::vector<int> const& lengths, std::vector<int
         int const largest = 1 + below(span);
         Operations operations;
         for (int i = 0; i < length; ++i) {
-            auto const kind = static_cast<Kind>(kinds[static_cast<std::size_t>(below(static_cast<int>(kinds.size())))]);
+            auto const kind =
+                static_cast<Kind>(kinds[static_cast<std::size_t>(below(static_cast<int>(kinds.size())))]);
             int const x = below(span) - span / 4;
             int const y = below(span) - span / 4;
-            operations.push_back({kind, below(kRegions), below(kRegions), {x, y, x + below(largest), y + below(largest)}});
+            operations.push_back(
+                {kind, below(kRegions), below(kRegions), {x, y, x + below(largest), y + below(largest)}});
             if (kind == Move) operations.back().rect = {below(7) - 3, below(7) - 3, 0, 0};
         }
         if (!failure(operations).empty()) {
@@ -208,7 +228,8 @@ std::string PixelDifference(Operations const& operations)
         target.GetOuterRect(outer);
         for (int y = outer.y1 - 1; y <= outer.y2; ++y)
             for (int x = outer.x1 - 1; x <= outer.x2; ++x)
-                if (target.Contains(x, y) != expected.contains({y, x})) return "Contains: " + BandsText(target) + "\n";
+                if (target.Contains(x, y) != expected.contains({y, x}))
+                    return "Contains: " + BandsText(target) + "\n";
         int x = 0;
         int y = 0;
         target.GetSomePoint(x, y);
@@ -220,9 +241,10 @@ std::string PixelDifference(Operations const& operations)
 
 constexpr int kEveryKind[] = {AddRect, AddRect, AddRect, SubtractRect, SubtractRect, IntersectRect, AddRegion,
     SubtractRegion, SubtractRegion, IntersectRegion, SetRect, SetRegion, Move, Clear};
-constexpr int kMostlyRects[] = {AddRect, AddRect, AddRect, AddRect, AddRect, AddRect, SubtractRect, SubtractRect,
-    SubtractRect, AddRegion, SubtractRegion, SetRegion, Move, Move, Move, Move};
-constexpr int kMerges[] = {AddRect, AddRect, SubtractRect, IntersectRect, AddRegion, SubtractRegion, IntersectRegion};
+constexpr int kMostlyRects[] = {AddRect, AddRect, AddRect, AddRect, AddRect, AddRect, SubtractRect,
+    SubtractRect, SubtractRect, AddRegion, SubtractRegion, SetRegion, Move, Move, Move, Move};
+constexpr int kMerges[] = {
+    AddRect, AddRect, SubtractRect, IntersectRect, AddRegion, SubtractRegion, IntersectRegion};
 
 }
 
@@ -230,13 +252,15 @@ TEST(RegionRandom, MergesEqualThePlainSteps)
 {
     CollectAssertions();
     EXPECT_EQ(Difference(kReplay), "");
-    ExpectNoFailure(200'000, {5, 20, 60}, {6, 12, 40}, {std::begin(kEveryKind), std::end(kEveryKind)}, Difference);
+    ExpectNoFailure(
+        200'000, {5, 20, 60}, {6, 12, 40}, {std::begin(kEveryKind), std::end(kEveryKind)}, Difference);
 }
 
 TEST(RegionRandom, LargeListsEqualThePlainSteps)
 {
     CollectAssertions();
-    ExpectNoFailure(20'000, {200, 1000}, {100, 400}, {std::begin(kMostlyRects), std::end(kMostlyRects)}, Difference);
+    ExpectNoFailure(
+        20'000, {200, 1000}, {100, 400}, {std::begin(kMostlyRects), std::end(kMostlyRects)}, Difference);
 }
 
 TEST(RegionRandom, MergesEqualSetsOfPixels)

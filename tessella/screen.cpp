@@ -1,3 +1,0 @@
-#include <tessella/screen.h>
-
-constinit GrScreenRecord GrScreen;

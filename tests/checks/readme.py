@@ -1,0 +1,61 @@
+"""Builds the README's program as the README says, against an installed tree, with CMake and with pkg-config, and runs
+both on the virtual console. Argument: the build folder."""
+import os
+import pathlib
+import re
+import subprocess
+import sys
+import tempfile
+
+from tree import ROOT
+
+sys.path.append(str(ROOT / "tests" / "realconsole"))
+from picture import read_png  # noqa: E402
+
+# At the frame's inner edge on the left and on the right, one pixel on either side; the diagonal's first pixel.
+POINTS = [(15, 16), (16, 16), (623, 463), (624, 463), (32, 32)]
+PICTURE = ["2060A0", "000000", "000000", "2060A0", "FFD040"]
+CLEARED = ["000000"] * len(POINTS)
+
+
+def block(language, containing=""):
+    """The README's one code block of a language that contains a text."""
+    blocks = re.findall(rf"^```{language}\n(.*?)^```$", (ROOT / "README.md").read_text(encoding="utf-8"), re.M | re.S)
+    found = [text for text in blocks if containing in text]
+    assert len(found) == 1, f"{len(found)} {language} blocks with '{containing}' in the README"
+    return found[0]
+
+
+def run(*command, **options):
+    print("+", *command, flush=True)
+    subprocess.run(command, check=True, **options)
+
+
+build = pathlib.Path(sys.argv[1])
+with tempfile.TemporaryDirectory() as folder:
+    prefix, here = pathlib.Path(folder, "prefix"), pathlib.Path(folder, "hello")
+    here.mkdir()
+    run("cmake", "--install", build, "--prefix", prefix, stdout=subprocess.DEVNULL)
+    for name in ("common", "file"):
+        assert not (prefix / "include" / name).exists(), f"{name} is not for applications"
+
+    (here / "hello.cpp").write_text(block("cpp"), encoding="utf-8")
+    (here / "CMakeLists.txt").write_text(block("cmake"), encoding="utf-8")
+    strict = "-Wall -Wextra -Wpedantic -Wshadow -Werror"
+    run("cmake", "-G", "Ninja", "-S", here, "-B", here / "by_cmake", f"-DCMAKE_PREFIX_PATH={prefix}",
+        f"-DCMAKE_CXX_FLAGS={strict}", "-DCMAKE_FIND_USE_PACKAGE_REGISTRY=OFF", stdout=subprocess.DEVNULL)
+    run("cmake", "--build", here / "by_cmake", stdout=subprocess.DEVNULL)
+
+    environment = dict(os.environ, PKG_CONFIG_PATH=str(next(prefix.glob("lib*/**/pkgconfig"))))
+    run("sh", "-ec", block("sh", "pkg-config"), cwd=here, env=environment)
+
+    libraries = next(prefix.glob("lib*/**/libtessella.so.1")).parent
+    for program, extra in ((here / "by_cmake" / "hello", {}), (here / "hello", {"LD_LIBRARY_PATH": str(libraries)})):
+        for keys, colours in ((b"", PICTURE), (b"\n", CLEARED)):
+            picture = program.with_suffix(".png")
+            run(prefix / "bin" / "tessella-console", "--mode", "640x480x32", "--screenshot", picture, "--", program,
+                input=keys, env=dict(os.environ, **extra))
+            screen = read_png(picture)
+            found = [screen.at(y * screen.width + x) for x, y in POINTS]
+            assert found == colours, f"{found} instead of {colours}"
+print("the README's program builds and runs both ways")

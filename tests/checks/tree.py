@@ -1,0 +1,40 @@
+"""What the checks share: the tree's files, and running one command for each of many files."""
+import concurrent.futures
+import os
+import pathlib
+import subprocess
+import sys
+
+ROOT = pathlib.Path(__file__).resolve().parents[2]
+
+
+def files(*suffixes):
+    """Paths below ROOT with one of the suffixes, as strings with slashes; builds and hidden folders left out."""
+    found = []
+    for folder, folders, names in os.walk(ROOT):
+        folders[:] = [name for name in folders if not name.startswith((".", "build"))]
+        found += [pathlib.Path(folder, name) for name in names if name.endswith(suffixes)]
+    return sorted(path.relative_to(ROOT).as_posix() for path in found)
+
+
+def finish(looked_at, complaints):
+    """Prints the complaints and ends the check; a check that looked at nothing has failed."""
+    for complaint in complaints:
+        print(complaint)
+    if not looked_at:
+        sys.exit("nothing to check")
+    print(f"{looked_at} looked at, {len(complaints)} complaints")
+    sys.exit(1 if complaints else 0)
+
+
+def run_each(jobs):
+    """Runs (name, command, standard input) jobs, as many at once as there are processors. Complaints of those
+    that fail."""
+    def run(job):
+        name, command, text = job
+        done = subprocess.run(command, input=text, cwd=ROOT, text=True, check=False,
+                              stdout=subprocess.PIPE, stderr=subprocess.STDOUT)
+        return None if done.returncode == 0 else f"{name}:\n{done.stdout}"
+
+    with concurrent.futures.ThreadPoolExecutor(len(os.sched_getaffinity(0))) as pool:
+        return [complaint for complaint in pool.map(run, jobs) if complaint]

@@ -35,8 +35,8 @@ AssertFlags FlagOf(std::string_view text)
     return AssertOff;
 }
 
-/// Hexadecimal, as strtoull reads it. The prefix is looked for anywhere, but it is two characters at the start
-/// that are left out: "10x4" is no number, "zz0x4" is one.
+/// Hexadecimal, as strtoull reads it. The prefix is looked for anywhere, but it is two characters at the
+/// start that are left out: "10x4" is no number, "zz0x4" is one.
 std::optional<std::uint64_t> ReadNumber(char const* value)
 {
     if (std::strstr(value, "0x") || std::strstr(value, "0X")) value += 2;

@@ -12,8 +12,8 @@ struct Fault {
     int error = 0;
 };
 
-/// Reads "REQUEST=ERRNO": a request's name or a device's path, then the name or number of an error. Nothing if
-/// either is unknown.
+/// Reads "REQUEST=ERRNO": a request's name or a device's path, then the name or number of an error. Nothing
+/// if either is unknown.
 std::optional<Fault> ParseFault(std::string_view text);
 
 }

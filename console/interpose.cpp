@@ -1,8 +1,8 @@
-// The functions that stand before libc's. In the preloaded object they come first in the order of look-up; in a
-// test program they are the program's own, and its calls bind to them when it is linked.
+// The functions that stand before libc's. In the preloaded object they come first in the order of look-up; in
+// a test program they are the program's own, and its calls bind to them when it is linked.
 //
-// They have libc's names for the linker alone. Under these names libc's headers declare them, and with its checks
-// for buffers define some of them.
+// They have libc's names for the linker alone. Under these names libc's headers declare them, and with its
+// checks for buffers define some of them.
 
 #include <console/device_calls.h>
 

@@ -19,8 +19,8 @@ int Complain(std::string const& problem, int status)
     return status;
 }
 
-/// The preloaded object lies beside the tool in the build folder, and where the installation puts it otherwise.
-/// Empty if it is in neither place.
+/// The preloaded object lies beside the tool in the build folder, and where the installation puts it
+/// otherwise. Empty if it is in neither place.
 std::string FindPreloaded()
 {
     std::error_code error;

@@ -8,8 +8,8 @@ namespace console {
 class OwnedFd {
 public:
     OwnedFd() = default;
-    /// Takes the result of a system call that makes a descriptor. Throws `std::system_error` with `purpose` if
-    /// it failed.
+    /// Takes the result of a system call that makes a descriptor. Throws `std::system_error` with `purpose`
+    /// if it failed.
     OwnedFd(int result, char const* purpose);
     ~OwnedFd();
     OwnedFd(OwnedFd&& other) noexcept;

@@ -1,4 +1,5 @@
-// The start of the preloaded object: it finds the console that the tool has made, and answers for it from then on.
+// The start of the preloaded object: it finds the console that the tool has made, and answers for it from
+// then on.
 
 #include <console/device_calls.h>
 #include <console/environment.h>

@@ -51,8 +51,8 @@ struct ColourMap {
     std::array<std::uint16_t, 256> red{}, green{}, blue{};
 };
 
-/// All that the devices know. It lies in memory that the tool and the program share, so that the tool can look
-/// at it while the program runs and after it has died; it therefore holds no pointers.
+/// All that the devices know. It lies in memory that the tool and the program share, so that the tool can
+/// look at it while the program runs and after it has died; it therefore holds no pointers.
 struct State {
     static constexpr std::uint32_t kMagic = 0x54434F4E;
 
@@ -82,8 +82,8 @@ static_assert(std::atomic<unsigned>::is_always_lock_free);
 
 void InitMutex(State& state);
 
-/// Holds the state for a scope. Signals wait meanwhile: a handler may make requests of its own, and would wait
-/// for its own thread. A process that dies within the scope doesn't lock out the others.
+/// Holds the state for a scope. Signals wait meanwhile: a handler may make requests of its own, and would
+/// wait for its own thread. A process that dies within the scope doesn't lock out the others.
 class StateLock {
 public:
     explicit StateLock(State& shared);

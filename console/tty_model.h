@@ -4,8 +4,9 @@
 
 namespace console {
 
-/// The console driver behind the tty: keyboard and console modes, LEDs, and the switching between consoles. The
-/// program sits on console 1; on all others nobody asks for a say. Any thread, any process that shares the state.
+/// The console driver behind the tty: keyboard and console modes, LEDs, and the switching between consoles.
+/// The program sits on console 1; on all others nobody asks for a say. Any thread, any process that shares
+/// the state.
 class TtyModel {
 public:
     explicit TtyModel(State& shared) : tty(shared.ttyState) {}
@@ -14,8 +15,8 @@ public:
     /// request. The caller holds the state.
     int Answer(Request request, void* argument);
 
-    /// Asks for a switch, as VT_ACTIVATE does and as the keys of another console do. 0, or ENXIO for a console
-    /// that doesn't exist. The caller holds the state.
+    /// Asks for a switch, as VT_ACTIVATE does and as the keys of another console do. 0, or ENXIO for a
+    /// console that doesn't exist. The caller holds the state.
     int Activate(unsigned long console);
 
 private:

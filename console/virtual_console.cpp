@@ -43,8 +43,8 @@ VirtualConsole::~VirtualConsole()
     if (attached) Attach(nullptr);
 }
 
-// What the child needs is inherited by it, so it isn't closed on exec: the state, the framebuffer and both ends of
-// the mouse.
+// What the child needs is inherited by it, so it isn't closed on exec: the state, the framebuffer and both
+// ends of the mouse.
 
 void VirtualConsole::MakeState(Setup const& setup)
 {

@@ -30,8 +30,8 @@ struct Setup {
 ///     EXPECT_EQ(console.Tty().consoleMode, KD_GRAPHICS);
 ///     EXPECT_EQ(console.Count(Request::MapMemory), 1u);
 ///
-/// It links `tessella_console_models` and, for `AttachProcess` to have an effect, `tessella_console_interpose`.
-/// All members may be called on any thread and while the program runs.
+/// It links `tessella_console_models` and, for `AttachProcess` to have an effect,
+/// `tessella_console_interpose`. All members may be called on any thread and while the program runs.
 class VirtualConsole {
 public:
     /// Throws `std::system_error` if the system refuses memory, descriptors or a pseudo-terminal.
@@ -46,7 +46,8 @@ public:
 
     /// The descriptor that tells a child process of this console; see `kStateVariable`.
     int StateFd() const { return stateFd.Get(); }
-    /// The other end of the tty: what a program writes is read here, and what is written here are its key bytes.
+    /// The other end of the tty: what a program writes is read here, and what is written here are its key
+    /// bytes.
     int KeyboardFd() const { return ttyMaster.Get(); }
 
     /// From now on the call fails with `error`; with 0 it works again.
@@ -57,8 +58,9 @@ public:
     unsigned Count(Request request);
     unsigned CountOpens(char const* path);
 
-    /// Changes what the driver says of the mode, as if the console's mode had been set anew. The memory and what
-    /// is in it stay, and so do mappings of it. The mode must be one that `ParseMode` and `IsPitchValid` accept.
+    /// Changes what the driver says of the mode, as if the console's mode had been set anew. The memory and
+    /// what is in it stay, and so do mappings of it. The mode must be one that `ParseMode` and `IsPitchValid`
+    /// accept.
     void ChangeMode(DisplayMode const& mode, std::optional<PixelFormat> const& format = {});
 
     TtyState Tty();

@@ -1,7 +1,7 @@
 // Regions, patterns, inversion and single pixels, in whatever mode the screen has.
 //
-// first_picture leaves its picture standing when it ends; first_picture --hold prints "ready", waits for a line
-// on its standard input and then ends the session as an application does.
+// first_picture leaves its picture standing when it ends; first_picture --hold prints "ready", waits for a
+// line on its standard input and then ends the session as an application does.
 #include <tessella.h>
 
 #include <cstring>

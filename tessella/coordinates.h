@@ -6,8 +6,8 @@
 #include <cstdint>
 #include <limits>
 
-/// A coordinate moved by an offset. It stops at the ends of its range: what lies out there is clipped away, but
-/// must not come in again at the other side.
+/// A coordinate moved by an offset. It stops at the ends of its range: what lies out there is clipped away,
+/// but must not come in again at the other side.
 constexpr int Moved(int coordinate, int offset)
 {
     using Limits = std::numeric_limits<int>;

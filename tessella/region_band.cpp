@@ -4,15 +4,17 @@
 #include <memory>
 
 // The three merges of range lists share one shape. Where the other band begins and ends is searched for; the
-// ranges of this band in between, the window, are merged with the other's into a buffer; and what was made takes
-// the window's place, in this band or in a copy of it. Ranges outside the window are at most moved as a block.
+// ranges of this band in between, the window, are merged with the other's into a buffer; and what was made
+// takes the window's place, in this band or in a copy of it. Ranges outside the window are at most moved as a
+// block.
 //
 //     band    ===  ===   ====  ==  ===       other      ==  =====  =
 //                  [   window   ]            made   ===  ========  ===
 //
 // Capacity. A list grows by 10 slots whenever a walk in place, writing behind its own reading, would have to
-// write more than it has read. The buffer makes that walk unnecessary, but not its arithmetic: each merge notes
-// the largest number of slots that the walk would need at any moment, and the capacity rises to it in tens.
+// write more than it has read. The buffer makes that walk unnecessary, but not its arithmetic: each merge
+// notes the largest number of slots that the walk would need at any moment, and the capacity rises to it in
+// tens.
 
 using Band = GrRegion::Band;
 
@@ -46,8 +48,8 @@ struct Window {
     RangeBuffer buffer;
 };
 
-/// `result` = `band` with the ranges `first` to `last` - 1 replaced by `made`, and the capacity of `band` raised
-/// to give room for `peak` ranges.
+/// `result` = `band` with the ranges `first` to `last` - 1 replaced by `made`, and the capacity of `band`
+/// raised to give room for `peak` ranges.
 void Splice(Band& result, Band const& band, int first, int last, GrRange const* made,
     std::ptrdiff_t madeCount, int peak)
 {

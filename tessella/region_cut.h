@@ -2,9 +2,9 @@
 
 #include <tessella/region.h>
 
-/// `result` = the pixels that `region` shares with `other`: the same bands and ranges as a copy of `region` that
-/// is then intersected with `other`, made without copying what the intersection drops. An empty result may have
-/// fewer bands. `result` is neither of the two, and its storage is only ever enlarged. Any thread.
+/// `result` = the pixels that `region` shares with `other`: the same bands and ranges as a copy of `region`
+/// that is then intersected with `other`, made without copying what the intersection drops. An empty result
+/// may have fewer bands. `result` is neither of the two, and its storage is only ever enlarged. Any thread.
 void CutRegion(GrRegion& result, GrRegion const& region, GrRegion const& other);
 void CutRegion(GrRegion& result, GrRegion const& region, GrRect const& rect);
 

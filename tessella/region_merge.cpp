@@ -1,7 +1,7 @@
 #include <tessella/region_rewriter.h>
 
-// How two regions are merged. Both lists run from top to bottom; one cursor walks each, and the merge rewrites
-// this region's list in place:
+// How two regions are merged. Both lists run from top to bottom; one cursor walks each, and the merge
+// rewrites this region's list in place:
 //
 //     this region    other          union          difference     intersection
 //      0 +--------+
@@ -10,22 +10,23 @@
 //      6 +--------+     |      |    (6,8)  src
 //                     8 +------+
 //
-// A band that the other's band cuts horizontally is split: its upper part becomes a new band above it, and it goes
-// on with the rest. So each step commits one finished band and shortens or leaves behind what it was made of.
+// A band that the other's band cuts horizontally is split: its upper part becomes a new band above it, and it
+// goes on with the rest. So each step commits one finished band and shortens or leaves behind what it was
+// made of.
 //
 // What holds the lists together:
-//   - A band that loses all its ranges stays, empty. Where bands lie apart, a union puts an empty band between
-//     them; only what it appends at the very end may leave a hole with no band in it.
-//   - Committing a band with the same ranges as the one above makes that one longer instead. It asks for nothing
-//     else, so a hole between equal bands is filled when a merge passes over it.
-//   - A union that has taken part of `src` already (it reached beyond the band it met) merges the rest into the
-//     bands that follow, but no longer adds rows between them; and what is left above the next band comes as a
-//     whole, so that bands can overlap.
-//   - An intersection cuts rows that meet no band of the other region with that region's next band below: an empty
-//     one, unless they lie in a hole without a band.
+//   - A band that loses all its ranges stays, empty. Where bands lie apart, a union puts an empty band
+//     between them; only what it appends at the very end may leave a hole with no band in it.
+//   - Committing a band with the same ranges as the one above makes that one longer instead. It asks for
+//     nothing else, so a hole between equal bands is filled when a merge passes over it.
+//   - A union that has taken part of `src` already (it reached beyond the band it met) merges the rest into
+//     the bands that follow, but no longer adds rows between them; and what is left above the next band comes
+//     as a whole, so that bands can overlap.
+//   - An intersection cuts rows that meet no band of the other region with that region's next band below: an
+//     empty one, unless they lie in a hole without a band.
 //
-// Bands, counts and recorded capacities, also those of spare slots, are exactly what merging slot by slot leaves;
-// BandRewriter and the merges of bands keep that account while moving blocks.
+// Bands, counts and recorded capacities, also those of spare slots, are exactly what merging slot by slot
+// leaves; BandRewriter and the merges of bands keep that account while moving blocks.
 
 using Band = GrRegion::Band;
 
@@ -57,7 +58,8 @@ private:
 
 SingleRegion rectRegion;
 
-/// Appends the bands behind the last one, none of them joined; one that would begin above its end is shortened.
+/// Appends the bands behind the last one, none of them joined; one that would begin above its end is
+/// shortened.
 void Append(GrItemArray<Band>& bands, Band const* src, Band const* srcEnd)
 {
     int const need = bands.item_count + static_cast<int>(srcEnd - src);

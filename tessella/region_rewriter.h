@@ -7,11 +7,11 @@
 ///     begin        to            to+spares     from          end            capacity
 ///     | written    | spare slots | (unused)    | unread      | spare slots  |
 ///
-/// The slots between are spare: they own range arrays for reuse. A new band goes into the first of them; a band
-/// that is kept exchanges places with it, so the spares queue up behind. When there is none and more must be
-/// written than was read, a gap opens: the spare slots at the end of the list change places with the unread
-/// bands, and after them come 10 fresh slots at a time. The recorded capacity counts these tens, while the block
-/// itself is made large enough for what is likely to follow; only then are there unused slots.
+/// The slots between are spare: they own range arrays for reuse. A new band goes into the first of them; a
+/// band that is kept exchanges places with it, so the spares queue up behind. When there is none and more
+/// must be written than was read, a gap opens: the spare slots at the end of the list change places with the
+/// unread bands, and after them come 10 fresh slots at a time. The recorded capacity counts these tens, while
+/// the block itself is made large enough for what is likely to follow; only then are there unused slots.
 class BandRewriter {
 public:
     using Band = GrRegion::Band;
@@ -52,8 +52,8 @@ public:
         return *to;
     }
 
-    /// Ends the band in the slot at `to`. One with the same ranges as the band above only makes that one longer,
-    /// wherever it lies: that is how a vertical hole between equal bands is filled.
+    /// Ends the band in the slot at `to`. One with the same ranges as the band above only makes that one
+    /// longer, wherever it lies: that is how a vertical hole between equal bands is filled.
     void Commit()
     {
         if (to != begin && SameRanges(*to, to[-1])) {
@@ -111,8 +111,8 @@ private:
         alignas(Band) unsigned char bytes[kMost * sizeof(Band)];
     };
 
-    /// Moves the next `count` bands down to the written ones. One by one each would take the place of the first
-    /// spare slot, which then queues up last; so the spares come out turned by `count` places.
+    /// Moves the next `count` bands down to the written ones. One by one each would take the place of the
+    /// first spare slot, which then queues up last; so the spares come out turned by `count` places.
     void MoveRun(std::ptrdiff_t count)
     {
         SavedSlots saved;
@@ -135,8 +135,9 @@ private:
         from += count;
     }
 
-    /// Only called when there is no spare slot before the unread bands. The spare slots behind them change places
-    /// with them, the last pair first, which turns the spares; or else, when all are in use, 10 new ones open.
+    /// Only called when there is no spare slot before the unread bands. The spare slots behind them change
+    /// places with them, the last pair first, which turns the spares; or else, when all are in use, 10 new
+    /// ones open.
     void OpenGap(std::ptrdiff_t following)
     {
         GR_ASSERT_TEXT(spares == 0, "from==to");

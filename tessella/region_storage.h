@@ -20,8 +20,8 @@ constexpr int GrownCapacity(int capacity, int need)
     return need <= capacity ? capacity : capacity + (need - capacity + kGrowth - 1) / kGrowth * kGrowth;
 }
 
-/// Block moves of slots. A band moves with its storage: the slot it leaves must be overwritten, or a copy of a
-/// slot that was saved before must go somewhere, so that each range array keeps exactly one owner.
+/// Block moves of slots. A band moves with its storage: the slot it leaves must be overwritten, or a copy of
+/// a slot that was saved before must go somewhere, so that each range array keeps exactly one owner.
 template <typename T>
 void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
 {
@@ -159,14 +159,15 @@ inline bool SameRanges(GrRegion::Band const& a, GrRegion::Band const& b)
 }
 
 /// `result` = `band`, followed by `AddBand`, `RemoveBand` or `IntersectBand` with `other`: the ranges and the
-/// capacity come out as if done in these two steps. `result` may be `band` itself. A band without ranges stays
-/// without under the latter two.
+/// capacity come out as if done in these two steps. `result` may be `band` itself. A band without ranges
+/// stays without under the latter two.
 void AssignUnion(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
 void AssignDifference(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
 void AssignIntersection(GrRegion::Band& result, GrRegion::Band const& band, GrRegion::Band const& other);
 
-/// The first band that is empty, begins above its predecessor (which begins at `above`), or has a range that is
-/// empty or begins before its predecessor ends; `end` if there is none. The second form needs wide registers.
+/// The first band that is empty, begins above its predecessor (which begins at `above`), or has a range that
+/// is empty or begins before its predecessor ends; `end` if there is none. The second form needs wide
+/// registers.
 GrRegion::Band const* FirstImperfectPlain(GrRegion::Band const* band, GrRegion::Band const* end, int above);
 GrRegion::Band const* FirstImperfectWide(GrRegion::Band const* band, GrRegion::Band const* end, int above);
 bool WideRegistersPresent();

@@ -6,9 +6,9 @@
 #include <immintrin.h>
 #endif
 
-// The check that ends every merge. Nearly always nothing is wrong, and the check must not cost more than the merge:
-// so a quick pass looks for the next band that is not in perfect order, which is a stricter question with a simpler
-// answer, and only the bands that it stops at are judged by the rules.
+// The check that ends every merge. Nearly always nothing is wrong, and the check must not cost more than the
+// merge: so a quick pass looks for the next band that is not in perfect order, which is a stricter question
+// with a simpler answer, and only the bands that it stops at are judged by the rules.
 
 using Band = GrRegion::Band;
 

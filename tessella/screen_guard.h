@@ -15,9 +15,9 @@ extern std::recursive_mutex screenMutex;
 extern std::atomic<std::uint32_t> hideCount;
 
 /// The bracket around all drawing on the framebuffer, for the pixels of a region or rectangle in screen
-/// coordinates, which may be empty. Guards nest on one thread, with any regions; a nested one costs one counter
-/// step. Left on every way out, exceptions included. Threads of the application take turns by `grabMutex`, not by
-/// this.
+/// coordinates, which may be empty. Guards nest on one thread, with any regions; a nested one costs one
+/// counter step. Left on every way out, exceptions included. Threads of the application take turns by
+/// `grabMutex`, not by this.
 class GrScreenGuard {
 public:
     explicit GrScreenGuard(GrRegion const& region);

@@ -4,7 +4,8 @@
 
 #include <pthread.h>
 
-/// The state of the session, global because input threads and signal handlers reach it with no object in hand.
+/// The state of the session, global because input threads and signal handlers reach it with no object in
+/// hand.
 
 /// Between a successful `GrInit` and the end of `GrDone`. The application's thread only.
 extern bool initialized;

@@ -32,7 +32,8 @@ int AssertErrno(int error, char const* file, unsigned line, char const* function
 /// 0 if assertions are off.
 int ReportFailure(char const* expression, char const* file, unsigned line, char const* text);
 
-/// For code of the library, which does not export it. Called while the "event" channel is on, as (5, 0, 27, text): once with the text of a report and once with
-/// its whole stack, on the thread that reports. Null until someone sets it, before other threads may report.
+/// For code of the library, which does not export it. Called while the "event" channel is on, as (5, 0, 27,
+/// text): once with the text of a report and once with its whole stack, on the thread that reports. Null
+/// until someone sets it, before other threads may report.
 using AssertEventSink = void (*)(int, int, int, char const*);
 extern AssertEventSink assertEventSink;

@@ -9,8 +9,9 @@ using StackFrameCallback = bool (*)(int frame, char const* line, void* context);
 /// Most bytes of a frame's line, with the closing 0.
 constexpr int kStackLineSize = 4096;
 
-/// Calls back for at most `frameCount` frames, and never more than 64, the innermost first. Frame 0 is the caller of WalkStack.
-/// A stack that cannot be read has no frames. From any thread; not for signal handlers, since it allocates.
+/// Calls back for at most `frameCount` frames, and never more than 64, the innermost first. Frame 0 is the
+/// caller of WalkStack. A stack that cannot be read has no frames. From any thread; not for signal handlers,
+/// since it allocates.
 void WalkStack(int frameCount, StackFrameCallback callback, void* context);
 
 /// Turns a line of backtrace_symbols, "module(symbol+offset) rest", into aligned columns with the symbol

@@ -20,8 +20,8 @@ enum : std::uint32_t { GrRasterModeCopy = 4 };
 /// Whoever made a context deletes it. It does not own the pixels that it draws on, which must outlive it, and
 /// the region that it is limited to must lie on them: nothing checks that.
 ///
-/// Contexts are for one thread at a time, whichever surface they draw on. Those of the screen keep clear of the
-/// library's own input threads by themselves.
+/// Contexts are for one thread at a time, whichever surface they draw on. Those of the screen keep clear of
+/// the library's own input threads by themselves.
 ///
 /// The operations are declared in the order of their table, which is part of the library's interface.
 class GR_API GrContext {
@@ -42,8 +42,8 @@ public:
     virtual void ExcludeClipRegion(GrRegion const& region) = 0;
     /// Makes the clip as large as the context's limit again.
     virtual void ResetClipRegion() = 0;
-    /// Writes the smallest rectangle around the clip, in context coordinates, into `rect`; around an empty clip,
-    /// the empty rectangle at surface point (0, 0).
+    /// Writes the smallest rectangle around the clip, in context coordinates, into `rect`; around an empty
+    /// clip, the empty rectangle at surface point (0, 0).
     virtual void GetClipRect(GrRect& rect) = 0;
 
     /// Puts context point (0, 0) at `x`, `y` from the context's base origin.
@@ -56,9 +56,10 @@ public:
     /// Chooses the colour of set pattern bits, converted to a pixel value once, here.
     virtual void SetForeColor(GrColor color) = 0;
 
-    /// Chooses the pattern, copied from eight bytes, one a row, bit 0 being the leftmost pixel. It is anchored
-    /// to the surface, not to the origin, and moved by `dx` to the right and `dy` downward, of any sign. A clear bit paints
-    /// the back colour, or nothing if `transparent` is set. A new context's pattern is all ones.
+    /// Chooses the pattern, copied from eight bytes, one a row, bit 0 being the leftmost pixel. It is
+    /// anchored to the surface, not to the origin, and moved by `dx` to the right and `dy` downward, of any
+    /// sign. A clear bit paints the back colour, or nothing if `transparent` is set. A new context's pattern
+    /// is all ones.
     virtual void SetPattern(std::uint8_t const bits[8], int dx, int dy, bool transparent) = 0;
 
     /// `GrRasterModeCopy`, or any other value to invert pixels.
@@ -66,16 +67,16 @@ public:
     /// The value last set; `GrRasterModeCopy` in a new context.
     virtual std::uint32_t GetRasterMode() = 0;
 
-    /// The colour of one pixel; 0 outside the clip, as is a black pixel inside it, and where there are no pixels.
-    /// Only true-colour images give an alpha value.
+    /// The colour of one pixel; 0 outside the clip, as is a black pixel inside it, and where there are no
+    /// pixels. Only true-colour images give an alpha value.
     virtual GrColor GetPixel(int x, int y) = 0;
     /// Paints one pixel through pattern and raster mode.
     virtual void DrawPixel(int x, int y) = 0;
     /// Paints a region through pattern and raster mode.
     virtual void FillRegion(GrRegion const& region) = 0;
 
-    /// Does nothing, unless the context can copy from another: then it fills the rectangle `dst` from `source`,
-    /// whose point `sx`, `sy`, in its own context coordinates, goes to the top left corner.
+    /// Does nothing, unless the context can copy from another: then it fills the rectangle `dst` from
+    /// `source`, whose point `sx`, `sy`, in its own context coordinates, goes to the top left corner.
     virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);
 };
 
@@ -84,7 +85,7 @@ class GR_API GrContextI : public GrContext {
 public:
     /// Puts both the base origin and the origin at surface point `x`, `y`.
     virtual void SetBaseOrigin(int x, int y) = 0;
-    /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it. It must lie
-    /// within the image: nothing checks that.
+    /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it. It must
+    /// lie within the image: nothing checks that.
     virtual void SetLimitRegion(GrRegion const& region) = 0;
 };

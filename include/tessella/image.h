@@ -28,9 +28,9 @@ public:
     unsigned char* pixels;      ///< rows from the top, without padding between them; owned; may be null
     unsigned char* alphaPlane;  ///< one byte a pixel; owned; may be null
 
-    /// An image of black pixels in the screen's format as it is now, or in true colour if `imageFlags` say so.
-    /// The alpha plane, if asked for, is not initialised. Without a positive width and height there is neither.
-    /// If memory runs out, `std::bad_alloc` leaves the constructor.
+    /// An image of black pixels in the screen's format as it is now, or in true colour if `imageFlags` say
+    /// so. The alpha plane, if asked for, is not initialised. Without a positive width and height there is
+    /// neither. If memory runs out, `std::bad_alloc` leaves the constructor.
     GrImage(int imageWidth, int imageHeight, std::uint32_t imageFlags);
 
     /// An image around pixels and alpha values allocated with `new[]`, either of which may be null; the image
@@ -43,17 +43,17 @@ public:
     GrImage& operator=(GrImage const&) = delete;
     ~GrImage();
 
-    /// Lets go of pixels and alpha plane without releasing them; they are the caller's from now on. Contexts made
-    /// before still draw on them.
+    /// Lets go of pixels and alpha plane without releasing them; they are the caller's from now on. Contexts
+    /// made before still draw on them.
     void Detach();
 
-    /// A new context over the image, in its format, with the image's size as its limit. The caller deletes it,
-    /// before the image. Null for `bits` that no format has, after a failed assertion. An image in the screen's
-    /// format does not survive a change of mode: its pixels may then be taken for wider ones.
+    /// A new context over the image, in its format, with the image's size as its limit. The caller deletes
+    /// it, before the image. Null for `bits` that no format has, after a failed assertion. An image in the
+    /// screen's format does not survive a change of mode: its pixels may then be taken for wider ones.
     GrContext* GetContext() const;
 
-    /// Changes `GrImageNoDither` and `GrImageOverBack` to what `newFlags` say, and nothing else. Contexts made
-    /// before keep the old ones.
+    /// Changes `GrImageNoDither` and `GrImageOverBack` to what `newFlags` say, and nothing else. Contexts
+    /// made before keep the old ones.
     void SetFlags(std::uint32_t newFlags);
 
     /// True if a pixel is a `GrColor`.

@@ -33,8 +33,8 @@ public:
     /// One horizontal band: its vertical extent `r1`, `r2`, and the x ranges that belong to the region in
     /// each of its rows. Plain data without constructor or destructor; the region owns `items`.
     struct GR_API Band : GrRange, GrItemArray<GrRange> {
-        /// Adds the pixels `from` to `to` - 1 to the ranges; `from` < `to`. A range that it only touches stays a
-        /// range of its own.
+        /// Adds the pixels `from` to `to` - 1 to the ranges; `from` < `to`. A range that it only touches
+        /// stays a range of its own.
         void AddRange(int from, int to);
 
         /// Adds every range of `other`, in order, whatever the vertical extents.
@@ -46,8 +46,8 @@ public:
         /// Keeps what this band's ranges, which must exist, share with those of `other`.
         void IntersectBand(Band const& other);
 
-        /// Opens a slot behind slot `i` (-1: at the head), whose contents the caller fills in. With `i` beyond
-        /// the end the list grows to `i` + 2 slots, and those in between are uninitialised too.
+        /// Opens a slot behind slot `i` (-1: at the head), whose contents the caller fills in. With `i`
+        /// beyond the end the list grows to `i` + 2 slots, and those in between are uninitialised too.
         void InsertItemAfter(int i);
 
         /// Removes the ranges `from` to `to`, both included.

@@ -8,13 +8,13 @@
 
 class GrImage;
 
-/// What is known of the screen; one global record, filled by `GrInit` and `GrChangeMode`. After one of them has
-/// failed it may tell of a mode that was refused.
+/// What is known of the screen; one global record, filled by `GrInit` and `GrChangeMode`. After one of them
+/// has failed it may tell of a mode that was refused.
 struct GrScreenRecord {
     int fbFd = -1;  ///< descriptor of the framebuffer device; -1 before it is opened
 
-    /// Base of the shared mapping. Null before the first mode and after the session; all bits set if the kernel
-    /// refused the mapping.
+    /// Base of the shared mapping. Null before the first mode and after the session; all bits set if the
+    /// kernel refused the mapping.
     unsigned char* fbMemory = nullptr;
     std::uint32_t fbLength = 0;       ///< length of the mapping in bytes
     std::uint32_t width = 0;          ///< visible size in pixels
@@ -27,16 +27,16 @@ struct GrScreenRecord {
     /// is in force.
     GrContext* context = nullptr;
 
-    /// Makes a context over the screen, limited to a region in screen coordinates, with its origin at the given
-    /// point. It fits the present mode only. The caller deletes it. Null before the first mode.
+    /// Makes a context over the screen, limited to a region in screen coordinates, with its origin at the
+    /// given point. It fits the present mode only. The caller deletes it. Null before the first mode.
     GrContext* (*createScreenContext)(GrRegion const& limit, int originX, int originY) = nullptr;
 
-    /// Makes a context over an image of the screen's pixel format. The caller deletes it, before the image. Null
-    /// before the first mode.
+    /// Makes a context over an image of the screen's pixel format. The caller deletes it, before the image.
+    /// Null before the first mode.
     GrContext* (*createImageContext)(GrImage* image) = nullptr;
 
-    /// Error rows for dithering on the screen, `width` times 3; only while `bytesPerPixel` is below 3. Owned and
-    /// used by the library alone.
+    /// Error rows for dithering on the screen, `width` times 3; only while `bytesPerPixel` is below 3. Owned
+    /// and used by the library alone.
     std::int32_t* ditherLine = nullptr;
 };
 

@@ -22,13 +22,13 @@ GR_API bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned 
 /// nothing; `GrScreen` keeps what it held, but for the context and the memory.
 GR_API void GrDone();
 
-/// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it. Contexts of the screen, and
-/// images in the screen's format, that were made before must not be used any more. References and `mode` are as
-/// for `GrInit`.
+/// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it. Contexts of the screen,
+/// and images in the screen's format, that were made before must not be used any more. References and `mode`
+/// are as for `GrInit`.
 ///
 /// False on failure, with the references unchanged and the reason on the standard error stream. The session
-/// is then without a context, and nothing may be drawn, on images of the screen's format either, until a later
-/// call succeeds. It fails before a session and after it.
+/// is then without a context, and nothing may be drawn, on images of the screen's format either, until a
+/// later call succeeds. It fails before a session and after it.
 GR_API bool GrChangeMode(unsigned& width, unsigned& height, unsigned& depth, unsigned mode);
 
 /// Whether the monitor can be asked about itself; always false. Any thread.

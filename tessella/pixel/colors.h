@@ -26,8 +26,8 @@ struct GrColors4 {
 
     static GrColor const palette[16];
 
-    /// The nearest palette index for 3 bits a channel; zero until `BuildColorCube` has run. Every run writes the
-    /// same values, so there is no lock.
+    /// The nearest palette index for 3 bits a channel; zero until `BuildColorCube` has run. Every run writes
+    /// the same values, so there is no lock.
     static std::atomic<Pixel> colorCube[512];
     static void BuildColorCube();
 

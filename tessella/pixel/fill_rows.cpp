@@ -19,9 +19,9 @@ struct Words {
     std::uint32_t a, b, c;
 };
 
-// A row is stored in blocks of words, which repeat after three blocks. It is a whole number of pixels, so its last
-// block begins at the third phase whatever the length, and may overlap the block before. Rows shorter than a
-// block are few and narrow; they are stored byte by byte.
+// A row is stored in blocks of words, which repeat after three blocks. It is a whole number of pixels, so its
+// last block begins at the third phase whatever the length, and may overlap the block before. Rows shorter
+// than a block are few and narrow; they are stored byte by byte.
 GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
 {
     using Block = std::uint32_t __attribute__((vector_size(64)));

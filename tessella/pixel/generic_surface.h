@@ -8,8 +8,8 @@
 #include <cstdint>
 
 /// Joins the place of the pixels (`Base`, over an image or the screen) to their width (`Surface`), and paints
-/// rows through pattern and raster mode. All coordinates are surface coordinates; nothing is checked here, the
-/// caller has clipped.
+/// rows through pattern and raster mode. All coordinates are surface coordinates; nothing is checked here,
+/// the caller has clipped.
 ///
 /// A pattern byte belongs to a row; its bit x & 7 decides the pixel in column x: set paints in the fore
 /// colour, clear in the back colour, or not at all if `transparent`. With a raster mode other than copy the
@@ -51,7 +51,8 @@ protected:
     /// raster mode is not looked at: callers that invert do so themselves.
     void PatternColumn(int x, int y, int count, Pixel setPixel, Pixel clearPixel) const;
 
-    /// Copies the rows of a rectangle from an image of the same format, whose `sx`, `sy` goes to its top left.
+    /// Copies the rows of a rectangle from an image of the same format, whose `sx`, `sy` goes to its top
+    /// left.
     void CopyRowsIn(GrRange xRange, GrRange yRange, GrImage const& image, int sx, int sy) const;
     /// Copies the rows of a rectangle to an image of the same format, from `dx`, `dy` there on.
     void CopyRowsOut(GrRange xRange, GrRange yRange, GrImage& image, int dx, int dy) const;

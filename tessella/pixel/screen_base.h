@@ -21,8 +21,8 @@ protected:
     std::int32_t originX, originY;
 };
 
-/// Contexts over the mapped framebuffer. They hold no address: base and stride are read from `GrScreen` at each
-/// use, since the mapping can go, with the session or for a new mode, while a context lives.
+/// Contexts over the mapped framebuffer. They hold no address: base and stride are read from `GrScreen` at
+/// each use, since the mapping can go, with the session or for a new mode, while a context lives.
 class GrScreenContextBase : public GrContextBase<GrScreenContextState> {
 protected:
     using GrContextBase::GrContextBase;

@@ -10,8 +10,8 @@
 /// is, and neither where the row lies nor what the pixel means. Pixels go through `memcpy`, since nothing
 /// promises that rows are aligned; it compiles to plain loads and stores.
 
-/// What a surface owes to the layers above: its pixel type, bytes a pixel, the pixel with all bits set, reading
-/// and writing one pixel, and filling a rectangle.
+/// What a surface owes to the layers above: its pixel type, bytes a pixel, the pixel with all bits set,
+/// reading and writing one pixel, and filling a rectangle.
 template <typename Surface>
 concept GrSurfacePolicy = std::unsigned_integral<typename Surface::Pixel> &&
     std::same_as<decltype(Surface::kBytes), int const> &&

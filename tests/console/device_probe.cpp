@@ -1,8 +1,8 @@
-// A program that uses the devices as a full-screen program does, and tells what it sees. It knows nothing of the
-// virtual console.
+// A program that uses the devices as a full-screen program does, and tells what it sees. It knows nothing of
+// the virtual console.
 //
 //   device_probe look               opens every device, makes every request, prints one line for each
-//   device_probe draw PIXEL...      puts pixels into the first row from the left and into the last from the right
+//   device_probe draw PIXEL...      puts pixels into the first row, from the left, and the last, from the right
 //   device_probe die PIXEL...       draws and kills itself
 //   device_probe wait               prints "ready" and waits for a signal
 

@@ -8,8 +8,8 @@
 #include <vector>
 
 /// The judge of contexts: a picture painted pixel by pixel, with the clip as one flag a pixel. It is slow and
-/// knows nothing of bands, spans or widths beyond a pixel's bytes. Coordinates off the surface are outside its
-/// limit, as they are outside that of a context.
+/// knows nothing of bands, spans or widths beyond a pixel's bytes. Coordinates off the surface are outside
+/// its limit, as they are outside that of a context.
 class Canvas {
 public:
     struct Format {

@@ -5,10 +5,10 @@
 #include <string>
 #include <vector>
 
-/// The region operations written as plain steps: every range and every slot moved on its own, growth by 10 slots
-/// whenever it is due, a check in full at the end. Slow on purpose, sharing no code with the library beyond the
-/// layout of a region, and kept as the judge of whatever is faster: bands, counts and capacities must agree, those
-/// of spare slots included.
+/// The region operations written as plain steps: every range and every slot moved on its own, growth by 10
+/// slots whenever it is due, a check in full at the end. Slow on purpose, sharing no code with the library
+/// beyond the layout of a region, and kept as the judge of whatever is faster: bands, counts and capacities
+/// must agree, those of spare slots included.
 namespace judge {
 
 void AddRange(GrRegion::Band& band, int a, int b);

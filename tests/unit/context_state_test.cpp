@@ -100,7 +100,8 @@ TEST(ContextState, EmptyClipPaintsNothingUntilReset)
     EXPECT_EQ(context->GetPixel(1, 1), 0xABCDEFu);
 }
 
-/// The place of a virtual function in its class's table, as this platform's C++ ABI keeps it in a pointer to it.
+/// The place of a virtual function in its class's table, as this platform's C++ ABI keeps it in a pointer to
+/// it.
 template <typename Pointer>
 std::size_t Slot(Pointer function)
 {

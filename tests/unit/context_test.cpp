@@ -11,8 +11,8 @@
 
 #include <sys/mman.h>
 
-// Random drawing on contexts of every format, over images and over a screen with a row pitch of its own, judged
-// by a canvas: after each operation every byte must be the same, also those that belong to no pixel.
+// Random drawing on contexts of every format, over images and over a screen with a row pitch of its own,
+// judged by a canvas: after each operation every byte must be the same, also those that belong to no pixel.
 
 namespace {
 
@@ -144,8 +144,8 @@ struct ResetScreen {
     ~ResetScreen() { GrScreen = {}; }
 };
 
-/// A screen in this process' memory, rows being five bytes longer than they need to be. The context sees all of it
-/// but a margin, and its base origin lies in there.
+/// A screen in this process' memory, rows being five bytes longer than they need to be. The context sees all
+/// of it but a margin, and its base origin lies in there.
 template <typename Surface, typename Colors>
 void JudgeScreen(unsigned bits, unsigned colorBits)
 {

@@ -8,7 +8,8 @@
 
 namespace {
 
-/// Joined, cut and moved at random, so that bands overlap, touch, lie empty or leave holes, as merges produce them.
+/// Joined, cut and moved at random, so that bands overlap, touch, lie empty or leave holes, as merges produce
+/// them.
 class RandomRegions {
 public:
     explicit RandomRegions(unsigned seed) : random(seed) {}

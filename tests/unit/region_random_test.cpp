@@ -11,8 +11,8 @@
 #include <sstream>
 
 // Random lists of operations on a few regions, done by the library and by the plain steps. After each one the
-// two must agree in everything that a region records, and must have raised the same assertions. A list that fails
-// is shrunk and printed in the form that kReplay takes.
+// two must agree in everything that a region records, and must have raised the same assertions. A list that
+// fails is shrunk and printed in the form that kReplay takes.
 
 namespace {
 
@@ -200,7 +200,8 @@ bool HasHole(GrRegion const& region)
 
 int judgedByPixels = 0;
 
-/// As above, with sets of pixels as the judge. Operations with regions that have a vertical hole are not judged.
+/// As above, with sets of pixels as the judge. Operations with regions that have a vertical hole are not
+/// judged.
 std::string PixelDifference(Operations const& operations)
 {
     std::array<GrRegion, kRegions> regions;

@@ -2,7 +2,8 @@
 
 #include <gtest/gtest.h>
 
-// The rules of the merges that surprise, each worked by hand. A region is written as its bands, "rows: ranges".
+// The rules of the merges that surprise, each worked by hand. A region is written as its bands, "rows:
+// ranges".
 
 namespace {
 
@@ -48,7 +49,8 @@ TEST_F(RegionRules, MergesSplitBandsWhereTheOtherBegins)
     EXPECT_EQ(Union("0..9: 0..4", "3..6: 2..6"), "0..3: 0..4 | 3..6: 0..6 | 6..9: 0..4");
 }
 
-// Ranges are joined when they share a pixel. Joining those that touch would change where error diffusion restarts.
+// Ranges are joined when they share a pixel. Joining those that touch would change where error diffusion
+// restarts.
 TEST_F(RegionRules, TouchingRangesStayApart)
 {
     GrRegion region = RegionOf("0..1: 0..10");
@@ -103,7 +105,8 @@ TEST_F(RegionRules, AMergeAcrossAHoleBetweenEqualBandsFillsIt)
     EXPECT_TRUE(region.Contains(0, 3));
 }
 
-// A band merged in part no longer adds rows of its own above the next band, but is copied whole if it ends there.
+// A band merged in part no longer adds rows of its own above the next band, but is copied whole if it ends
+// there.
 TEST_F(RegionRules, AUnionIntoAHoleOverlapsOrLeavesRowsOut)
 {
     EXPECT_EQ(
@@ -127,8 +130,8 @@ TEST_F(RegionRules, AUnionWithAHoleInTheOtherIsReportedAndGoesOn)
     EXPECT_EQ(TakeAssertions(), (Strings{"src_from->r1 <= dst_from->r2", "false", "VerifyRegion(*this)"}));
 }
 
-// Rows that meet no band of the other region are cut with its next band: empty in most regions, but not behind a
-// hole. Whatever lies above or below the other region goes.
+// Rows that meet no band of the other region are cut with its next band: empty in most regions, but not
+// behind a hole. Whatever lies above or below the other region goes.
 TEST_F(RegionRules, AnIntersectionAcrossAHoleMeetsTheBandBelowIt)
 {
     EXPECT_EQ(

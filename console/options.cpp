@@ -15,10 +15,11 @@ at the device paths where programs look for them. No root, no device and no chan
   --pitch BYTES               bytes from one row to the next, if more than the pixels need
   --screenshot FILE.png       when the program has ended, however it did, write what the screen shows
   --fault REQUEST=ERRNO       let a call fail, always. May be repeated. REQUEST is OPEN_FB, OPEN_TTY,
-                              OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO, FBIOGET_VSCREENINFO,
-                              FBIOPUTCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE, KDSETMODE, KDGKBLED, KDSKBLED,
-                              VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP, VT_ACTIVATE), or the path of
-                              one device, whose opening fails. ERRNO is a name (ENODEV) or a number
+                              OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
+                              FBIOGET_VSCREENINFO, FBIOPUTCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE, KDSETMODE,
+                              KDGKBLED, KDSKBLED, VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP,
+                              VT_ACTIVATE), or the path of one device, whose opening fails. ERRNO is a name
+                              (ENODEV) or a number
   --report BITS:RED,GREEN,BLUE
                               let the driver tell of pixels of BITS bits with fields of these lengths,
                               whatever the mode is: to see how a program takes a mode that it doesn't support

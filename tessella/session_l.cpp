@@ -6,8 +6,7 @@
 #include <tessella/vga_l.h>
 #include <tessella/whole_screen.h>
 
-#include <signal.h>
-
+#include <csignal>
 #include <cstdio>
 
 // What a failed start leaves open is left on purpose: `GrDone` has nothing to do then.

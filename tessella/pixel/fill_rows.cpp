@@ -33,7 +33,7 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
     unsigned char* row = rows.address;
     int height = rows.height;
 
-    auto const fill = [&]<typename Vector>(Vector const first, Vector const second, Vector const third) {
+    auto const fill = [&]<typename Vector>(Vector const& first, Vector const& second, Vector const& third) {
         constexpr std::ptrdiff_t kSize = sizeof(Vector);
         for (; height > 0; --height, row += stride) {
             unsigned char* to = row;

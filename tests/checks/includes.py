@@ -14,8 +14,9 @@ NEVER = [
     (r"(include|tessella|xml|bundle|examples)/.*(?<!_l)\.\w+", DEVICE,
      "logic runs on a machine without a console"),
     (r"(include/)?tessella/region.*",
-     rf"(?!include/tessella/(region|types|export)\.h|include/common/assert\.h|tessella/region|{CXX_LIBRARY}).*",
-     "a region knows types and assertions only"),
+     rf"(?!include/tessella/(region|types|export)\.h|tessella/coordinates\.h|include/common/assert\.h"
+     rf"|tessella/region|{CXX_LIBRARY}|<immintrin\.h>).*",
+     "a region knows coordinates and assertions only"),
     (r"tessella/pixel/.*", r"(include/)?tessella/(window|event|mouse|keyboard|key_layout|cursor|font|cgf|session_(l|state)).*",
      "a context knows a region, not who wants it"),
     (r"(include/)?tessella/(?!pixel/|video_mode|image).*", r"tessella/pixel/.*",

@@ -2,7 +2,7 @@
 // the virtual console.
 //
 //   device_probe look               opens every device, makes every request, prints one line for each
-//   device_probe draw PIXEL...      puts pixels into the first row, from the left, and the last, from the right
+//   device_probe draw PIXEL...      puts pixels into the first row and, from the right, into the last
 //   device_probe die PIXEL...       draws and kills itself
 //   device_probe wait               prints "ready" and waits for a signal
 

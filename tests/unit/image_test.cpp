@@ -6,7 +6,6 @@
 #include <gtest/gtest.h>
 
 #include <memory>
-#include <typeinfo>
 
 namespace {
 
@@ -20,7 +19,7 @@ bool Gives(int bits, int bytes, std::uint32_t flags = 0)
         image.bytes = bytes;
     }
     std::unique_ptr<GrContext> const context(image.GetContext());
-    return typeid(*context) == typeid(GrImageContext<Surface, Colors>);
+    return dynamic_cast<GrImageContext<Surface, Colors>*>(context.get()) != nullptr;
 }
 
 TEST(Image, ContextFollowsTheFormat)

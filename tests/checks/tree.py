@@ -4,6 +4,7 @@ import os
 import pathlib
 import subprocess
 import sys
+import typing
 
 ROOT = pathlib.Path(__file__).resolve().parents[2]
 
@@ -27,14 +28,27 @@ def finish(looked_at, complaints):
     sys.exit(1 if complaints else 0)
 
 
+class Job(typing.NamedTuple):
+    name: object
+    command: list
+    text: str = None  # standard input
+    stamp: pathlib.Path = None  # a file that stands for this very job's success, now or in an earlier run
+
+
 def run_each(jobs):
-    """Runs (name, command, standard input) jobs, as many at once as there are processors. Complaints of those
-    that fail."""
+    """Runs the jobs that have not succeeded yet, as many at once as there are processors. Complaints of those that
+    fail."""
     def run(job):
-        name, command, text = job
-        done = subprocess.run(command, input=text, cwd=ROOT, text=True, check=False,
+        if job.stamp and job.stamp.exists():
+            return None
+        done = subprocess.run(job.command, input=job.text, cwd=ROOT, text=True, check=False,
                               stdout=subprocess.PIPE, stderr=subprocess.STDOUT)
-        return None if done.returncode == 0 else f"{name}:\n{done.stdout}"
+        if done.returncode != 0:
+            return f"{job.name}:\n{done.stdout}"
+        if job.stamp:
+            job.stamp.parent.mkdir(exist_ok=True)
+            job.stamp.touch()
+        return None
 
     with concurrent.futures.ThreadPoolExecutor(len(os.sched_getaffinity(0))) as pool:
         return [complaint for complaint in pool.map(run, jobs) if complaint]

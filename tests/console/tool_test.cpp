@@ -94,8 +94,8 @@ TEST(ConsoleTool, StatusAndMessageTellWhatWentWrong)
     struct {
         int status;
         char const *words, *text;
-    } const cases[] = {{2, "", "no program is given"}, {2, "--mode 8x8x8 --", "no program is given"},
-        {2, "--colour -- true", "unknown option '--colour'"}, {2, "--mode", "--mode needs a value"},
+    } const cases[] = {{2, "", "no program is given"}, {2, "--colour -- true", "unknown option '--colour'"},
+        {2, "--mode", "--mode needs a value"},
         {2, "--mode 640x480x12 -- true", "the mode '640x480x12' isn't supported"},
         {2, "--mode 0x480x8 -- true", "isn't supported"}, {2, "--mode 8x9000x8 -- true", "isn't supported"},
         {2, "--mode 8x8x8x -- true", "isn't supported"},
@@ -122,13 +122,12 @@ TEST(ConsoleTool, ProgramEndsWithTheTool)
 {
     // The tool hands on a request to end; its sudden death takes the program along.
     for (std::string const signal : {"TERM", "HUP", "KILL"})
-        EXPECT_EQ(Shell("exec 2>/dev/null; file=/tmp/tessella-console-$$; " CONSOLE_TOOL
-                        " -- sh -c 'echo $$; exec sleep 60' >$file & tool=$!;"
-                        "until [ -s $file ]; do sleep 0.05; done; read program <$file; rm $file; kill -" +
-                      signal +
-                      " $tool; wait $tool; kill -l $?;"
-                      "for i in 1 2 3 4 5 6 7 8 9 10; do grep -qs 'State:.[RSD]' /proc/$program/status || "
-                      "exec echo gone; sleep 0.1; done")
+        EXPECT_EQ(Shell("signal=" + signal +
+                      "; exec 2>/dev/null; file=/tmp/tessella-console-$$;" CONSOLE_TOOL
+                      " -- sh -c 'echo $$; exec sleep 60' >$file & tool=$!;"
+                      "until [ -s $file ]; do sleep 0.05; done; read program <$file; rm $file;"
+                      "kill -$signal $tool; wait $tool; kill -l $?; for i in 1 2 3 4 5 6 7 8 9 10; do"
+                      " grep -q 'State:.[RSD]' /proc/$program/status || exec echo gone; sleep 0.1; done")
                       .out,
             signal + "\ngone\n");
 }

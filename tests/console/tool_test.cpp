@@ -3,8 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <csignal>
-#include <cstring>
-#include <filesystem>
 #include <sstream>
 #include <vector>
 
@@ -24,22 +22,6 @@ ChildOutcome Shell(std::string const& command)
 ChildOutcome OnConsole(std::string const& words) { return Shell(CONSOLE_TOOL " " + words); }
 
 std::string const kScreenshot = testing::TempDir() + "tessella-console-" + std::to_string(getpid()) + ".png";
-
-/// As 0xRRGGBB.
-std::vector<unsigned> TakeScreenshot()
-{
-    png_image image{};
-    image.version = PNG_IMAGE_VERSION;
-    EXPECT_NE(png_image_begin_read_from_file(&image, kScreenshot.c_str()), 0);
-    EXPECT_EQ(image.width, 7U);
-    image.format = PNG_FORMAT_BGRA;
-    std::vector<unsigned> pixels(std::size_t{image.width} * image.height);
-    png_image_finish_read(&image, nullptr, pixels.data(), 0, nullptr);
-    std::filesystem::remove(kScreenshot);
-    for (unsigned& pixel : pixels)
-        pixel &= 0xFFFFFF;
-    return pixels;
-}
 
 TEST(ConsoleTool, ScreenshotShowsThePixelsOfEachModeEvenOfAKilledProgram)
 {
@@ -63,7 +45,17 @@ TEST(ConsoleTool, ScreenshotShowsThePixelsOfEachModeEvenOfAKilledProgram)
         std::vector<unsigned> expected(21, &c == cases ? 0x00FF00 : 0);
         std::copy(c.shown.begin(), c.shown.end(), expected.begin());
         std::copy(c.shown.begin(), c.shown.end(), expected.rbegin());
-        EXPECT_EQ(TakeScreenshot(), expected) << c.options;
+        png_image image{};
+        image.version = PNG_IMAGE_VERSION;
+        ASSERT_NE(png_image_begin_read_from_file(&image, kScreenshot.c_str()), 0);
+        ASSERT_TRUE(image.width == 7 && image.height == 3);
+        image.format = PNG_FORMAT_BGRA;
+        std::vector<unsigned> pixels(21);
+        png_image_finish_read(&image, nullptr, pixels.data(), 0, nullptr);
+        for (unsigned& pixel : pixels)
+            pixel &= 0xFFFFFF;
+        EXPECT_EQ(pixels, expected) << c.options;
+        unlink(kScreenshot.c_str());
     }
 }
 

@@ -14,7 +14,6 @@
 
 namespace {
 
-constexpr auto kOff = static_cast<std::uint64_t>(AssertOff);
 constexpr char kText[] = "Assertion failed: a == b, file part, line 7\n";
 int const logFd = memfd_create("log", 0);
 std::string const logPath = "/proc/self/fd/" + std::to_string(logFd);
@@ -51,11 +50,11 @@ TEST(Assert, SettingsAreReadFromNumbersAndWords)
     // Only 127 characters count: the fifth of "abort" is the last.
     std::string const blanks(122, ' '), last = blanks + "abort none", cut = blanks + " abort";
     std::pair<char const*, std::uint64_t> const cases[] = {{nullptr, 0x4E}, {"", 0x4E}, {"0x24", 0x24},
-        {"0X2f", 0x2F}, {"24", 0x24}, {"0x0", kOff}, {"0x24 ", kOff}, {"-1", kOff},
-        {"0x1FFFFFFFFFFFFFFFF", kOff}, {"zz0x24", 0x24}, {" 0x24", kOff}, {"10x24", kOff}, {"break", 0x01},
-        {"debug", 0x02}, {"log", 0x04}, {"event", 0x08}, {"msgbox", 0x10}, {"abort", 0x20}, {"stack", 0x40},
-        {"  log   abort log ", 0x24}, {" ", 0}, {"Log", kOff}, {"log none stack", kOff}, {last.c_str(), 0x20},
-        {cut.c_str(), kOff}};
+        {"0X2f", 0x2F}, {"24", 0x24}, {"0x0", AssertOff}, {"0x24 ", AssertOff}, {"-1", AssertOff},
+        {"0x1FFFFFFFFFFFFFFFF", AssertOff}, {"zz0x24", 0x24}, {" 0x24", AssertOff}, {"10x24", AssertOff},
+        {"break", 0x01}, {"debug", 0x02}, {"log", 0x04}, {"event", 0x08}, {"msgbox", 0x10}, {"abort", 0x20},
+        {"stack", 0x40}, {"  log   abort log ", 0x24}, {" ", 0}, {"Log", AssertOff},
+        {"log none stack", AssertOff}, {last.c_str(), 0x20}, {cut.c_str(), AssertOff}};
     for (auto const& c : cases) {
         auto const read = [&] { return ReadAssertSettings().flags != c.second; };
         EXPECT_EQ(RunWith(c.first, nullptr, read).status, 0) << (c.first ? c.first : "unset");
@@ -143,12 +142,11 @@ TEST(Assert, TrapsOnlyForADebugger)
     for (auto const& c : cases) {
         std::vector<int> stops;
         auto const debug = [&](pid_t child) {
-            int status = -1;
-            while (waitpid(child, &status, 0) == child && WIFSTOPPED(status)) {
+            for (int status = 0; waitpid(child, &status, 0) == child && WIFSTOPPED(status);) {
                 stops.push_back(WSTOPSIG(status));
                 ptrace(PTRACE_CONT, child, nullptr, WSTOPSIG(status) == SIGTRAP ? 0 : WSTOPSIG(status));
             }
-            return status;
+            return 0;
         };
         auto const fail = [&] { return ptrace(PTRACE_TRACEME, 0, nullptr, nullptr) == 0 ? c.fail() : 99; };
         RunWith(c.value, nullptr, fail, debug);

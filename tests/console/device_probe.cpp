@@ -2,7 +2,7 @@
 // the virtual console.
 //
 //   device_probe FLAGS PIXEL...     opens every device with further flags, makes every request, prints a line
-//                                   for each, and puts pixels into the first row and, from the right, the last
+//                                   for each, puts pixels into the first row and, from its end, the last
 
 #include <cerrno>
 #include <cstdint>

@@ -35,8 +35,8 @@ ChildOutcome RunWith(char const* settings, char const* logFile, auto body, auto.
 
 }
 
-// Outside the unnamed namespace and visible, so that stack reports name it. The empty statement keeps the call
-// from being the last thing it does, which would take its frame away; the pointer keeps it from being cloned.
+// Outside the unnamed namespace and visible, so that stack reports name it. The empty statement keeps the
+// call from being the last thing it does, which would take its frame away; the pointer keeps it from being cloned.
 [[gnu::noinline, gnu::visibility("default")]] int FailingPlace(int depth, bool call)
 {
     int result = depth > 0 ? FailingPlace(depth - 1, call) : call ? FailCall() : Fail();
@@ -51,10 +51,9 @@ TEST(Assert, SettingsAreReadFromNumbersAndWords)
     std::string const blanks(122, ' '), last = blanks + "abort none", cut = blanks + " abort";
     std::pair<char const*, std::uint64_t> const cases[] = {{nullptr, 0x4E}, {"", 0x4E}, {"0x24", 0x24},
         {"0X2f", 0x2F}, {"0x0", AssertOff}, {"0x1FFFFFFFFFFFFFFFF", AssertOff}, {"zz0x24", 0x24},
-        {" 0x24", AssertOff}, {"10x24", AssertOff}, {"break", 0x01}, {"debug", 0x02}, {"log", 0x04},
-        {"event", 0x08}, {"msgbox", 0x10}, {"abort", 0x20}, {"stack", 0x40}, {"  log   abort log ", 0x24},
-        {" ", 0}, {"Log", AssertOff}, {"log none stack", AssertOff}, {last.c_str(), 0x20},
-        {cut.c_str(), AssertOff}};
+        {" 0x24", AssertOff}, {"10x24", AssertOff}, {"break", 0x01}, {"log", 0x04}, {"event", 0x08},
+        {"msgbox", 0x10}, {"abort", 0x20}, {"stack", 0x40}, {"  log   abort log ", 0x24}, {" ", 0},
+        {"Log", AssertOff}, {"log none stack", AssertOff}, {last.c_str(), 0x20}, {cut.c_str(), AssertOff}};
     for (auto const& c : cases) {
         auto const read = [&] { return ReadAssertSettings().flags != c.second; };
         EXPECT_EQ(RunWith(c.first, nullptr, read).status, 0) << (c.first ? c.first : "unset");

@@ -1,4 +1,4 @@
-tessella_test(NAME assert_test LABEL unit SOURCES assert.cpp assert_stack.cpp)
+tessella_test(NAME assert_test LABEL unit SOURCES assert.cpp)
 # The names of the test's own functions must stand in the stack reports it looks at.
 set_target_properties(assert_test PROPERTIES ENABLE_EXPORTS ON)
 

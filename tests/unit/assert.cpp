@@ -1,273 +1,204 @@
 #include <common/assert.h>
 
-#include "assert_child.h"
 #include <common/assert_settings.h>
+#include <common/stack_walk.h>
+#include <support/child_process.h>
 
-#include <array>
+#include <algorithm>
 #include <cerrno>
 #include <csignal>
-#include <fstream>
 #include <gtest/gtest.h>
-#include <sstream>
 #include <sys/ptrace.h>
 #include <thread>
 #include <vector>
 
 namespace {
 
-constexpr auto kOff = static_cast<std::uint64_t>(AssertOff);
-constexpr auto kOut = AssertLogTarget::Stdout;
-constexpr auto kErr = AssertLogTarget::Stderr;
-constexpr auto kFile = AssertLogTarget::File;
+constexpr char kText[] = "Assertion failed: a == b, file part, line 7\n";
+int const logFd = memfd_create("log", 0);
+std::string const logPath = "/proc/self/fd/" + std::to_string(logFd);
 
-std::string LogPath() { return testing::TempDir() + "assert_" + std::to_string(getpid()) + ".log"; }
-
-std::string Contents(std::string const& path)
+/// Runs `body` under the given settings in a process of its own, since they are read once per process.
+ChildOutcome RunWith(char const* settings, char const* logFile, auto body, auto... parent)
 {
-    std::ostringstream text;
-    text << std::ifstream(path).rdbuf();
-    return text.str();
-}
-
-std::vector<std::string> Lines(std::string const& text)
-{
-    std::vector<std::string> lines;
-    std::istringstream stream(text);
-    for (std::string line; std::getline(stream, line);)
-        lines.push_back(line);
-    return lines;
-}
-
-int FailOnce() { return AssertFailed("a == b", "part", 7); }
-constexpr char kFailOnceText[] = "Assertion failed: a == b, file part, line 7\n";
-
-}
-
-// Outside the unnamed namespace and visible, so that stack reports name them. The empty statements keep the
-// calls from being the last thing these functions do, which would take their frames away.
-#define KEEP_FRAME(result) asm volatile("" : "+r"(result))
-
-[[gnu::noinline, gnu::visibility("default")]] int FailingPlace()
-{
-    int result = AssertFailed("a == b", "part", 7);
-    KEEP_FRAME(result);
-    return result;
-}
-
-[[gnu::noinline, gnu::visibility("default")]] int FailingCall()
-{
-    int result = AssertErrno(ENOENT, "part", 7, nullptr);
-    KEEP_FRAME(result);
-    return result;
-}
-
-[[gnu::noinline, gnu::visibility("default")]] int FailingDeepDown(int depth)
-{
-    int result = depth > 0 ? FailingDeepDown(depth - 1) : FailingPlace();
-    KEEP_FRAME(result);
-    return result;
-}
-
-TEST(AssertSettings, AreReadFromNumbersAndWords)
-{
-    std::string const blanks(122, ' ');
-    struct {
-        char const* value;
-        std::uint64_t flags;
-    } const cases[] = {{nullptr, 0x4E}, {"", 0x4E}, {"0x24", 0x24}, {"0X2f", 0x2F}, {"24", 0x24},
-        {"add", 0xADD}, {"0x0", kOff}, {"0", kOff}, {"0x", kOff}, {"0x24 ", kOff}, {"0x24g", kOff},
-        {"-1", kOff}, {"0xFFFFFFFFFFFFFFFF", kOff}, {"0x1FFFFFFFFFFFFFFFF", kOff}, {"zz24", kOff},
-        {"zz0x24", 0x24}, {" 24", 0x24}, {" 0x24", kOff}, {"10x24", kOff}, {"log 0x24", kOff},
-        {"break", 0x01}, {"debug", 0x02}, {"log", 0x04}, {"event", 0x08}, {"msgbox", 0x10}, {"abort", 0x20},
-        {"stack", 0x40}, {"  log   abort log ", 0x24}, {" ", 0}, {"none", kOff}, {"Log", kOff},
-        {"log,abort", kOff}, {"log none stack", kOff}};
-    unsetenv("VELLUM_SAFE_ASSERT_LOGFILE");
-    auto const flagsOf = [](char const* value) {
-        SetVariable("VELLUM_SAFE_ASSERT", value);
-        return ReadAssertSettings().flags;
+    auto const withSettings = [=] {
+        clearenv();
+        if (settings != nullptr) setenv("VELLUM_SAFE_ASSERT", settings, 1);
+        if (logFile != nullptr) setenv("VELLUM_SAFE_ASSERT_LOGFILE", logFile, 1);
+        return body();
     };
-    for (auto const& c : cases)
-        EXPECT_EQ(flagsOf(c.value), c.flags) << '"' << (c.value != nullptr ? c.value : "(unset)") << '"';
+    return RunChild(withSettings, parent...);
+}
+
+[[gnu::always_inline]] inline int Fail() { return AssertFailed("a == b", "part", 7); }
+[[gnu::always_inline]] inline int FailCall() { return AssertErrno(ENOENT, "part", 7, nullptr); }
+
+}
+
+// Outside the unnamed namespace and visible, so that stack reports name it. The empty statement keeps the
+// call from being the last thing it does, which would take its frame away; the pointer keeps it from being cloned.
+[[gnu::noinline, gnu::visibility("default")]] int FailingPlace(int depth, bool call)
+{
+    int result = depth > 0 ? FailingPlace(depth - 1, call) : call ? FailCall() : Fail();
+    asm volatile("" : "+r"(result));
+    return result;
+}
+static int (*volatile failingPlace)(int depth, bool call) = FailingPlace;
+
+TEST(Assert, SettingsAreReadFromNumbersAndWords)
+{
     // Only 127 characters count: the fifth of "abort" is the last.
-    EXPECT_EQ(flagsOf((blanks + "abort none").c_str()), 0x20U);
-    EXPECT_EQ(flagsOf((blanks + " abort").c_str()), kOff);
-    EXPECT_EQ(flagsOf((blanks + "     none").c_str()), 0U);
-    unsetenv("VELLUM_SAFE_ASSERT");
-}
-
-TEST(AssertSettings, LogTargetIsReadOnlyForTheLog)
-{
-    std::string const path = LogPath();
-    struct {
-        char const* value;
-        char const* logFile;
-        AssertLogTarget target;
-    } const cases[] = {{"log", nullptr, kErr}, {"log", "stdout", kOut}, {"log", "stderr", kErr},
-        {"log", "", kErr}, {"log", "/nowhere/at/all", kErr}, {"log", "/", kErr}, {"0x20", "stdout", kErr},
-        {"abort", "stdout", kErr}, {nullptr, "stdout", kErr}, {"0x24", "stdout", kOut},
-        {"stack log log", path.c_str(), kFile}, {"none log", path.c_str(), kFile},
-        {"0x4", path.c_str(), kFile}};
+    std::string const blanks(122, ' '), last = blanks + "abort none", cut = blanks + " abort";
+    std::pair<char const*, std::uint64_t> const cases[] = {{nullptr, 0x4E}, {"", 0x4E}, {"0x24", 0x24},
+        {"0X2f", 0x2F}, {"0x0", AssertOff}, {"0x1FFFFFFFFFFFFFFFF", AssertOff}, {"zz0x24", 0x24},
+        {" 0x24", AssertOff}, {"10x24", AssertOff}, {"break", 0x01}, {"log", 0x04}, {"event", 0x08},
+        {"msgbox", 0x10}, {"abort", 0x20}, {"stack", 0x40}, {"  log   abort log ", 0x24}, {" ", 0},
+        {"Log", AssertOff}, {"log none stack", AssertOff}, {last.c_str(), 0x20}, {cut.c_str(), AssertOff}};
     for (auto const& c : cases) {
-        SetVariable("VELLUM_SAFE_ASSERT", c.value);
-        SetVariable("VELLUM_SAFE_ASSERT_LOGFILE", c.logFile);
-        AssertSettings const settings = ReadAssertSettings();
-        EXPECT_EQ(settings.logTarget, c.target) << c.logFile;
-        EXPECT_EQ(settings.logFile != -1, c.target == kFile) << c.logFile;
-        if (settings.logFile != -1) close(settings.logFile);
+        auto const read = [&] { return ReadAssertSettings().flags != c.second; };
+        EXPECT_EQ(RunWith(c.first, nullptr, read).status, 0) << (c.first ? c.first : "unset");
     }
-    unsetenv("VELLUM_SAFE_ASSERT");
-    unsetenv("VELLUM_SAFE_ASSERT_LOGFILE");
-    unlink(path.c_str());
 }
 
-TEST(AssertReport, GoesWhereTheSettingsSay)
+TEST(Assert, ReportGoesWhereTheSettingsSay)
 {
-    std::string const path = LogPath();
     struct {
-        char const* value;
-        char const* logFile;
-        std::string out, err, file;
-        int result, signal;
-    } const cases[] = {{"log", nullptr, "", kFailOnceText, "", 1, 0},
-        {"log", "stdout", kFailOnceText, "", "", 1, 0}, {"log", path.c_str(), "", "", kFailOnceText, 1, 0},
-        {"log abort", nullptr, "", kFailOnceText, "", 0, SIGABRT},
-        {"log abort", "stdout", kFailOnceText, "", "", 0, SIGABRT},
-        {"0x24", path.c_str(), "", "", kFailOnceText, 0, SIGABRT}, {"abort", nullptr, "", "", "", 0, SIGABRT},
-        {"none", nullptr, "", "", "", 0, 0}, {"abort none", nullptr, "", "", "", 0, 0},
-        {"stack", nullptr, "", "", "", 1, 0}, {"debug stack", nullptr, "", "", "", 1, 0},
-        {"event stack", nullptr, "", "", "", 1, 0}, {"break msgbox", nullptr, "", "", "", 1, 0}};
+        char const *value, *logFile;
+        char where;  // the report is found: on one of the streams, in the file or nowhere
+        int status = 1 << 8;
+    } const cases[] = {{"log", nullptr, 'e'}, {"log", "stdout", 'o'}, {"log", "/", 'e'},
+        {"log log", logPath.c_str(), 'f'}, {"0x4", logPath.c_str(), 'f'},
+        {"log abort", nullptr, 'e', SIGABRT}, {"0x24", "stdout", 'o', SIGABRT},
+        {"abort", nullptr, '-', SIGABRT}, {"abort none log", nullptr, '-', 0}, {"debug stack", nullptr, '-'},
+        {"event stack", nullptr, '-'}};
     for (auto const& c : cases) {
-        SCOPED_TRACE(c.value);
-        std::ofstream(path) << "before\n";
-        ChildOutcome const outcome = RunChild(c.value, c.logFile, FailOnce);
-        EXPECT_EQ(outcome.out, c.out);
-        EXPECT_EQ(outcome.err, c.err);
-        EXPECT_EQ(Contents(path), "before\n" + c.file);
-        EXPECT_EQ(WIFSIGNALED(outcome.status) ? WTERMSIG(outcome.status) : 0, c.signal);
-        EXPECT_EQ(WIFEXITED(outcome.status) ? WEXITSTATUS(outcome.status) : 0, c.result);
+        ASSERT_EQ(ftruncate(logFd, 0) + pwrite(logFd, "before\n", 7, 0), 7);
+        ChildOutcome const outcome = RunWith(c.value, c.logFile, Fail);
+        EXPECT_EQ(outcome.out, c.where == 'o' ? kText : "") << c.value;
+        EXPECT_EQ(outcome.err, c.where == 'e' ? kText : "") << c.value;
+        EXPECT_EQ(ReadAll(logFd), std::string("before\n") + (c.where == 'f' ? kText : "")) << c.value;
+        EXPECT_EQ(outcome.status, c.status) << c.value;
     }
-    unlink(path.c_str());
 }
 
-TEST(AssertReport, TextsAreFormattedAndCut)
+TEST(Assert, TextsAreFormattedAndCut)
 {
     std::string const longText(5000, 'x');
-    ChildOutcome const outcome = RunChild("log", "stdout", [&] {
+    auto const fail = [&] {
         AssertFailed(nullptr, nullptr, 4000000000U);
         AssertFailed(longText.c_str(), "part", 7);
         AssertErrno(ENOENT, "part", 4000000000U, nullptr);
         AssertErrno(12345, "part", 7, "open");
         AssertErrno(ENOENT, "part", 7, longText.c_str());
-        ReportFailure("a == b", "part", 7, nullptr);
         setenv("VELLUM_SAFE_ASSERT", "none", 1);  // too late
-        return FailOnce() == 1 ? 0 : 1;
-    });
-    std::vector<std::string> const expected = {
-        "Assertion failed: (null), file (null), line -294967296",
-        "Assertion failed: " + std::string(539 - 18, 'x'),
-        "assert_test: part:4000000000: Unexpected error: No such file or directory.",
-        "assert_test: part:7: open: Unexpected error: Unknown error 12345.",
-        "assert_test: part:7: " + std::string(4095 - 21, 'x'),
-        "Assertion failed: a == b, file part, line 7",
+        return ReportFailure("a == b", "part", 7, nullptr) + Fail();
     };
-    EXPECT_EQ(Lines(outcome.out), expected);
-    EXPECT_EQ(outcome.status, 0);
+    EXPECT_EQ(RunWith("log", "stdout", fail).out,
+        "Assertion failed: (null), file (null), line -294967296\nAssertion failed: " +
+            longText.substr(0, 539 - 18) +
+            "\nassert_test: part:4000000000: Unexpected error: No such file or directory.\n"
+            "assert_test: part:7: open: Unexpected error: Unknown error 12345.\nassert_test: part:7: " +
+            longText.substr(0, 4095 - 21) + "\n" + kText);
 }
 
-TEST(AssertReport, LeavesErrnoAlone)
+TEST(Assert, StackStartsAtTheFailingPlaceAndErrnoIsLeftAlone)
 {
-    for (char const* const settings : {"log", "none log"})
-        for (char const* const logFile : {"/dev/full", "/nowhere/at/all"}) {
-            ChildOutcome const outcome = RunChild(settings, logFile, [] {
+    for (char const* const settings : {"", "log"})
+        for (bool const call : {false, true}) {
+            ChildOutcome const outcome = RunWith(settings, "/dev/full", [=] {
                 errno = EDOM;
-                AssertErrno(ENOENT, "part", 7, nullptr);
-                FailOnce();
-                return errno == EDOM ? 0 : 1;
+                return failingPlace(0, call) == 1 ? errno : 0;
             });
-            EXPECT_EQ(outcome.status, 0) << settings << ' ' << logFile;
+            EXPECT_EQ(WEXITSTATUS(outcome.status), EDOM);
+            std::string const stack = outcome.err.substr(outcome.err.find('\n') + 1);
+            EXPECT_EQ(stack.find(" ( FailingPlace(int, bool)") < stack.find('\n'), *settings == 0) << stack;
         }
 }
 
-TEST(AssertReport, StackStartsAtTheFailingPlace)
+TEST(Assert, SinkGetsTheTextAndThenTheWholeStack)
 {
-    for (auto const& [fail, name] :
-        {std::pair{&FailingPlace, "FailingPlace()"}, std::pair{&FailingCall, "FailingCall()"}}) {
-        ChildOutcome const outcome = RunChild(nullptr, nullptr, fail);
-        std::vector<std::string> const lines = Lines(outcome.err);
-        ASSERT_GT(lines.size(), 3U) << outcome.err;
-        EXPECT_NE(lines[1].find(std::string(" ( ") + name + "   "), std::string::npos) << lines[1];
-        EXPECT_EQ(outcome.err.find(name), outcome.err.rfind(name));
-        EXPECT_EQ(WEXITSTATUS(outcome.status), 1);
-    }
-}
-
-TEST(AssertReport, SinkGetsTheTextAndThenTheWholeStack)
-{
-    ChildOutcome const outcome = RunChild("event log stack", nullptr, [] {
-        assertEventSink = [](int a, int b, int c, char const* text) {
-            std::printf("<%d %d %d>\n%s\n", a, b, c, text);
-        };
-        return FailingDeepDown(40) + ReportFailure(nullptr, nullptr, 0, "alone");
+    auto const [out, err, status] = RunWith("event log stack", nullptr, [] {
+        assertEventSink = [](int a, int b, int c, auto s) { std::printf("<%d %d %d>\n%s\n", a, b, c, s); };
+        return failingPlace(40, false) + ReportFailure(nullptr, nullptr, 0, "alone");
     });
-    EXPECT_EQ(WEXITSTATUS(outcome.status), 2);
-    // 32 frames are walked, and two of them are the reporting functions; the second report is shallow.
-    std::vector<std::string> const logged = Lines(outcome.err);
-    ASSERT_GT(logged.size(), 31U + 1);
-    EXPECT_EQ(logged[31], "alone");
-    std::string expected;
-    for (std::size_t i = 0; i < logged.size(); ++i)
-        expected += (i <= 1 || i == 31 || i == 32 ? "<5 0 27>\n" : "") + logged[i] + '\n';
-    EXPECT_EQ(outcome.out, expected);
-    for (std::size_t i = 2; i < 31; ++i)
-        EXPECT_NE(logged[i].find("FailingDeepDown(int)"), std::string::npos) << logged[i];
+    std::string const mark = "<5 0 27>\n";
+    auto const stack = err.find('\n') + 1, alone = err.find("alone\n"), rest = alone + 6;
+    EXPECT_EQ(out,
+        mark + kText + mark + err.substr(stack, alone - stack) + mark + "alone\n" + mark + err.substr(rest));
+    // 32 frames are walked, of which two are the reporting functions'.
+    EXPECT_EQ(std::count(err.begin(), err.begin() + static_cast<long>(alone), '\n'), 31);
 }
 
-TEST(AssertReport, TrapsOnlyForADebugger)
+TEST(Assert, TrapsOnlyForADebugger)
 {
     struct {
         char const* value;
         int (*fail)();
         std::vector<int> stops;
-    } const cases[] = {{"break", FailOnce, {SIGTRAP}},
-        {"break", [] { return AssertErrno(EIO, "part", 7, nullptr); }, {SIGTRAP}},
-        {"msgbox", FailOnce, {SIGTRAP}}, {"msgbox", [] { return AssertErrno(EIO, "part", 7, nullptr); }, {}},
-        {"break msgbox abort", FailOnce, {SIGTRAP, SIGABRT}}, {"debug", FailOnce, {}}};
+    } const cases[] = {{"break", Fail, {SIGTRAP}}, {"break", FailCall, {SIGTRAP}},
+        {"msgbox", Fail, {SIGTRAP}}, {"msgbox", FailCall, {}},
+        {"break msgbox abort", Fail, {SIGTRAP, SIGABRT}}, {"debug", Fail, {}}};
     for (auto const& c : cases) {
         std::vector<int> stops;
-        ChildOutcome const outcome = RunChild(
-            c.value, nullptr,
-            [&] { return ptrace(PTRACE_TRACEME, 0, nullptr, nullptr) == 0 ? c.fail() : 99; },
-            [&](pid_t child) {
-                int status = -1;
-                while (waitpid(child, &status, 0) == child && WIFSTOPPED(status)) {
-                    stops.push_back(WSTOPSIG(status));
-                    int const passed = WSTOPSIG(status) == SIGTRAP ? 0 : WSTOPSIG(status);
-                    ptrace(PTRACE_CONT, child, nullptr, passed);
-                }
-                return status;
-            });
+        auto const debug = [&](pid_t child) {
+            for (int status = 0; waitpid(child, &status, 0) == child && WIFSTOPPED(status);) {
+                stops.push_back(WSTOPSIG(status));
+                ptrace(PTRACE_CONT, child, nullptr, WSTOPSIG(status) == SIGTRAP ? 0 : WSTOPSIG(status));
+            }
+            return 0;
+        };
+        auto const fail = [&] { return ptrace(PTRACE_TRACEME, 0, nullptr, nullptr) == 0 ? c.fail() : 99; };
+        RunWith(c.value, nullptr, fail, debug);
         EXPECT_EQ(stops, c.stops) << c.value;
-        EXPECT_TRUE(c.stops.size() < 2 ? WEXITSTATUS(outcome.status) == 1 : WIFSIGNALED(outcome.status));
     }
 }
 
-TEST(AssertReport, ThreadsShareOneLogFile)
+TEST(Assert, ThreadsShareOneLogFile)
 {
-    std::string const path = LogPath();
-    ChildOutcome const outcome = RunChild("log", path.c_str(), [] {
-        std::array<std::jthread, 8> threads;
-        for (std::jthread& thread : threads)
-            thread = std::jthread([] {
-                for (int n = 0; n < 50; ++n)
-                    FailOnce();
-            });
-        threads = {};
+    ASSERT_EQ(ftruncate(logFd, 0), 0);
+    RunWith("log", logPath.c_str(), [] {
+        std::vector<std::jthread> threads;
+        while (threads.size() < 8)
+            threads.emplace_back([] { return Fail() + Fail() + Fail() + Fail() + Fail(); });
         return 0;
     });
-    std::string expected;
-    for (int i = 0; i < 8 * 50; ++i)
-        expected += kFailOnceText;
-    EXPECT_EQ(Contents(path), expected);
-    EXPECT_EQ(outcome.status, 0);
-    unlink(path.c_str());
+    EXPECT_EQ(ReadAll(logFd).size(), 8 * 5 * (sizeof kText - 1));
+}
+
+TEST(Stack, LineIsCutIntoColumnsAtTheLastMarksAndToItsBuffer)
+{
+    auto const line = [](char const* module, char const* name, char const* offset, char const* rest) {
+        char text[4096];
+        std::snprintf(
+            text, sizeof text, "%-30s ( %-40s  %c %-6s) %s", module, name, *offset ? '+' : ' ', offset, rest);
+        return std::string(text);
+    };
+    std::string const name(5000, 'f');
+    std::pair<std::string, std::string> const cases[] = {
+        {"lib.so(_Z3foov+0x123456789) [0x55]", line("lib.so", "foo()", "0x123456789", " [0x55]")},
+        {"a(b)(_Zbad)c", line("a(b)", "_Zbad", "", "c")}, {"(a+b+c)", line("", "a+b", "c", "")},
+        {"/c++/prog(main) + 3", line("/c++/prog", "main", "", " + 3")},
+        {"m(" + name + "+0x1) [0x2]", line("m", name.c_str(), "0x1", " [0x2]")}, {name, name.substr(0, 4095)},
+        {"prog(main", "prog(main" + std::string(31, ' ')}, {"a(b)c(", "a(b)c(" + std::string(34, ' ')}};
+    for (auto [symbols, expected] : cases) {
+        char text[kStackLineSize];
+        FormatStackLine(symbols.data(), text);
+        EXPECT_EQ(text, expected);
+    }
+}
+
+// The loader tells a program's file by its first argument, whatever that says.
+TEST(LibraryPath, ComesFromTheLoaderOrElseFromTheProgram)
+{
+    std::string const program = ASSERT_PATH_PROBE, longest(4094, 'x');
+    std::string const cases[][3] = {{"/usr", "/x//y/../lib", "/x/lib"},
+        {"/usr", "x/./../y/..z/.../", "/usr/y/..z/..."}, {"/usr/lib", "../../../y", "/y"},
+        {"/usr", "../", "/"}, {"/", "./y", "/y"}, {"/usr", "plain", program},
+        {"/usr", '/' + longest, '/' + longest}, {"/usr", "/x" + longest, program}};
+    for (auto const& c : cases) {
+        auto const run = [&] {
+            return chdir(c[0].data()) == 0 ? execl(program.data(), c[1].data(), nullptr) : 99;
+        };
+        EXPECT_EQ(RunChild(run).out, c[2]);
+    }
 }

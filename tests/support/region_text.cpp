@@ -12,10 +12,10 @@ static std::vector<std::string> assertions;
 
 static void Collect(int, int, int, char const* text)
 {
-    static std::string const kHead = "Assertion failed: ", kFile = ", file ";
-    static std::string const kTail = kFile + GR_SOURCE("tessella/region") + ", line ";
+    static std::string const kHead = "Assertion failed: ", kTail = GR_SOURCE("tessella/region");
     std::string const report = text;
-    std::size_t const end = report.starts_with(kHead) ? report.find(kTail) : report.npos;
+    std::size_t const end =
+        report.starts_with(kHead) ? report.find(", file " + kTail + ", line ") : report.npos;
     assertions.push_back(end == report.npos ? report : report.substr(kHead.size(), end - kHead.size()));
 }
 
@@ -37,15 +37,14 @@ std::string BandsText(GrRegion const& region)
 
 std::string CapacitiesText(GrRegion const& region)
 {
-    std::ostringstream out;
     auto const& [bands, count, capacity] = region.bands;
-    out << capacity << ":";
+    std::ostringstream out;
     int last = capacity;
     while (last > count && bands[last - 1].items == nullptr)
         --last;
     for (int i = 0; i < last; ++i)
         out << (i == count ? " | " : " ") << (bands[i].items == nullptr ? 0 : bands[i].item_capacity);
-    return out.str();
+    return std::to_string(capacity) + ":" + out.str();
 }
 
 GrRegion RegionOf(std::string const& text)
@@ -54,13 +53,12 @@ GrRegion RegionOf(std::string const& text)
     int const count = static_cast<int>(std::count(text.begin(), text.end(), '|')) + 1;
     region.bands = {new GrRegion::Band[static_cast<std::size_t>(count)](), count, count};
     std::istringstream in(text);
-    for (GrRegion::Band* band = region.bands.items; in >> static_cast<GrRange&>(*band); ++band) {
+    for (GrRegion::Band* band = region.bands.items; in >> static_cast<GrRange&>(*band);
+         ++band, in.clear(), in.ignore()) {
         std::vector<GrRange> const ranges(std::istream_iterator<GrRange>(in.ignore()), {});
-        band->items = new GrRange[ranges.size()];
-        band->item_count = band->item_capacity = static_cast<int>(ranges.size());
+        int const size = static_cast<int>(ranges.size());
+        static_cast<GrItemArray<GrRange>&>(*band) = {new GrRange[ranges.size()], size, size};
         std::copy(ranges.begin(), ranges.end(), band->items);
-        in.clear();
-        in.ignore();
     }
     return region;
 }

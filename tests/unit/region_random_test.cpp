@@ -94,7 +94,8 @@ Pixels PixelsOf(GrRegion const& region)
 bool HasHole(GrRegion const& region)
 {
     for (int i = 1; i < region.bands.item_count; ++i)
-        if (region.bands.items[i - 1].r2 != region.bands.items[i].r1) return true;
+        if (GrRegion::Band const* b = &region.bands.items[i]; b->r1 >= b->r2 || b[-1].r2 != b->r1)
+            return true;
     return false;
 }
 

@@ -4,48 +4,24 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <iterator>
 #include <sstream>
 #include <utility>
 
-namespace {
+static std::vector<std::string> assertions;
 
-std::vector<std::string> assertions;
-
-void Collect(int, int, int, char const* text)
+static void Collect(int, int, int, char const* text)
 {
-    static std::string const kHead = "Assertion failed: ";
-    static std::string const kModule = std::string(", file ") + GR_SOURCE("tessella/region") + ", line ";
+    static std::string const kHead = "Assertion failed: ", kTail = GR_SOURCE("tessella/region");
     std::string const report = text;
-    std::size_t const end = report.find(kModule);
-    bool const wellFormed = report.starts_with(kHead) && end != std::string::npos;
-    assertions.push_back(
-        wellFormed ? report.substr(kHead.size(), end - kHead.size()) : "malformed: " + report);
+    std::size_t const end =
+        report.starts_with(kHead) ? report.find(", file " + kTail + ", line ") : report.npos;
+    assertions.push_back(end == report.npos ? report : report.substr(kHead.size(), end - kHead.size()));
 }
 
-std::istream& operator>>(std::istream& in, GrRange& range)
-{
-    char dot = 0;
-    return in >> range.r1 >> dot >> dot >> range.r2;
-}
+static std::istream& operator>>(std::istream& in, GrRange& r) { return (in >> r.r1).ignore(2) >> r.r2; }
 
-std::ostream& operator<<(std::ostream& out, GrRange const& range)
-{
-    return out << range.r1 << ".." << range.r2;
-}
-
-template <typename T>
-void Append(GrItemArray<T>& list, T*& slot)
-{
-    T* const larger = new T[static_cast<std::size_t>(list.item_count) + 1]();
-    std::copy_n(reinterpret_cast<char*>(list.items), sizeof(T) * static_cast<std::size_t>(list.item_count),
-        reinterpret_cast<char*>(larger));
-    delete[] list.items;
-    list.items = larger;
-    slot = &larger[list.item_count];
-    list.item_capacity = ++list.item_count;
-}
-
-}
+static std::ostream& operator<<(std::ostream& out, GrRange const& r) { return out << r.r1 << ".." << r.r2; }
 
 std::string BandsText(GrRegion const& region)
 {
@@ -61,34 +37,27 @@ std::string BandsText(GrRegion const& region)
 
 std::string CapacitiesText(GrRegion const& region)
 {
+    auto const& [bands, count, capacity] = region.bands;
     std::ostringstream out;
-    out << region.bands.item_capacity << ":";
-    int last = region.bands.item_capacity;
-    while (last > region.bands.item_count && region.bands.items[last - 1].items == nullptr)
+    int last = capacity;
+    while (last > count && bands[last - 1].items == nullptr)
         --last;
-    for (int i = 0; i < last; ++i) {
-        GrRegion::Band const& band = region.bands.items[i];
-        out << (i == region.bands.item_count ? " | " : " ")
-            << (band.items == nullptr ? 0 : band.item_capacity);
-    }
-    return out.str();
+    for (int i = 0; i < last; ++i)
+        out << (i == count ? " | " : " ") << (bands[i].items == nullptr ? 0 : bands[i].item_capacity);
+    return std::to_string(capacity) + ":" + out.str();
 }
 
 GrRegion RegionOf(std::string const& text)
 {
     GrRegion region;
-    std::istringstream bandTexts(text);
-    for (std::string bandText; std::getline(bandTexts, bandText, '|');) {
-        std::istringstream in(bandText);
-        GrRegion::Band* band = nullptr;
-        Append(region.bands, band);
-        char colon = 0;
-        in >> static_cast<GrRange&>(*band) >> colon;
-        for (GrRange range{}; in >> range;) {
-            GrRange* slot = nullptr;
-            Append(*band, slot);
-            *slot = range;
-        }
+    int const count = static_cast<int>(std::count(text.begin(), text.end(), '|')) + 1;
+    region.bands = {new GrRegion::Band[static_cast<std::size_t>(count)](), count, count};
+    std::istringstream in(text);
+    for (GrRegion::Band* band = region.bands.items; in >> static_cast<GrRange&>(*band);
+         ++band, in.clear(), in.ignore()) {
+        std::vector<GrRange> const ranges(std::istream_iterator<GrRange>(in.ignore()), {});
+        std::copy(ranges.begin(), ranges.end(), band->items = new GrRange[ranges.size()]);
+        band->item_count = band->item_capacity = static_cast<int>(ranges.size());
     }
     return region;
 }
@@ -97,6 +66,7 @@ void CollectAssertions()
 {
     setenv("VELLUM_SAFE_ASSERT", "event", 1);
     assertEventSink = Collect;
+    assertions.clear();
 }
 
 std::vector<std::string> TakeAssertions() { return std::exchange(assertions, {}); }

@@ -1,8 +1,6 @@
 tessella_test(NAME region_test LABEL unit SOURCES
     region_random_test.cpp
-    region_cut_test.cpp
     region_rules_test.cpp
     region_test.cpp
     ../support/region_judge.cpp
-    ../support/region_judge_band.cpp
     ../support/region_text.cpp)

@@ -1,132 +1,158 @@
 #include <support/region_judge.h>
 #include <support/region_text.h>
+#include <tessella/region_cut.h>
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <array>
-#include <functional>
+#include <bitset>
 #include <random>
-#include <set>
 #include <sstream>
 
-// Random lists of operations on a few regions, done by the library and by the plain steps. After each one the
-// two must agree in everything that a region records, and must have raised the same assertions. A list that
-// fails is shrunk and printed in the form that kReplay takes.
+// Random lists of operations on a few regions. After each one the library must agree with a judge. A list
+// that fails is shrunk and printed in the form that kReplay takes.
 
 namespace {
 
-enum Kind {
-    AddRect,
-    SubtractRect,
-    IntersectRect,
-    AddRegion,
-    SubtractRegion,
-    IntersectRegion,
-    SetRect,
-    SetRegion,
-    Move,
-    Clear
-};
-constexpr char const* kKindNames[] = {"AddRect", "SubtractRect", "IntersectRect", "AddRegion",
-    "SubtractRegion", "IntersectRegion", "SetRect", "SetRegion", "Move", "Clear"};
-constexpr int kRegions = 3;
-constexpr int kMostBands =
-    1000;  // lists with overlapping bands can double with every union: they start again
-
+/// With a rectangle: + - & =. With another region: u(nite) s(ubtract) i(ntersect) a(ssign). And m(ove),
+/// c(lear).
 struct Operation {
-    Kind kind;
+    char kind;
     int target, other;
     GrRect rect;
 };
 using Operations = std::vector<Operation>;
+template <typename Region>
+using Regions = std::array<Region, 3>;
+
+/// What is wrong after some operation, or "".
+using Judge = std::string(Operations const&);
 
 /// Paste a shrunk list here to step through it.
 Operations const kReplay = {};
 
-std::string Text(Operations const& operations)
+template <typename Region>
+Region& Perform(Regions<Region>& regions, Operation const& o)
 {
-    std::ostringstream out;
-    for (Operation const& o : operations)
-        out << "    {" << kKindNames[o.kind] << ", " << o.target << ", " << o.other << ", {" << o.rect.x1
-            << ", " << o.rect.y1 << ", " << o.rect.x2 << ", " << o.rect.y2 << "}},\n";
-    return out.str();
-}
-
-void ByLibrary(std::array<GrRegion, kRegions>& regions, Operation const& o)
-{
-    GrRegion& target = regions[static_cast<std::size_t>(o.target)];
-    GrRegion const& other = regions[static_cast<std::size_t>(o.other)];
+    Region& target = regions.at(static_cast<std::size_t>(o.target));
+    Region const& other = regions.at(static_cast<std::size_t>(o.other));
+    if (target.bands.item_count > 1000) target.Clear();  // overlapping bands can double with every union
     switch (o.kind) {
-    case AddRect: target += o.rect; break;
-    case SubtractRect: target -= o.rect; break;
-    case IntersectRect: target &= o.rect; break;
-    case AddRegion: target += other; break;
-    case SubtractRegion: target -= other; break;
-    case IntersectRegion: target &= other; break;
-    case SetRect: target = o.rect; break;
-    case SetRegion: target = other; break;
-    case Move: target.Offset(o.rect.x1, o.rect.y1); break;
-    case Clear: target.Clear(); break;
+    case '+': target += o.rect; break;
+    case '-': target -= o.rect; break;
+    case '&': target &= o.rect; break;
+    case '=': target = o.rect; break;
+    case 'u': target += other; break;
+    case 's': target -= other; break;
+    case 'i': target &= other; break;
+    case 'a': target = other; break;
+    case 'm': target.Offset(o.rect.x1, o.rect.y1); break;
+    default: target.Clear();
     }
+    return target;
 }
 
-void ByJudge(std::array<GrRegion, kRegions>& regions, Operation const& o)
+std::string State(GrRegion const& region, std::vector<std::string> const& reports)
 {
-    GrRegion& target = regions[static_cast<std::size_t>(o.target)];
-    GrRegion const& other = regions[static_cast<std::size_t>(o.other)];
-    switch (o.kind) {
-    case AddRect: judge::Add(target, o.rect); break;
-    case SubtractRect: judge::Subtract(target, o.rect); break;
-    case IntersectRect: judge::Intersect(target, o.rect); break;
-    case AddRegion: judge::Add(target, other); break;
-    case SubtractRegion: judge::Subtract(target, other); break;
-    case IntersectRegion: judge::Intersect(target, other); break;
-    case SetRect: judge::Assign(target, o.rect); break;
-    case SetRegion: judge::Assign(target, other); break;
-    case Move: target.Offset(o.rect.x1, o.rect.y1); break;
-    case Clear: target.Clear(); break;
-    }
+    std::string text = BandsText(region) + "\n  capacities " + CapacitiesText(region) + "\n";
+    for (std::string const& report : reports)
+        text.append("  ").append(report).append("\n");
+    return text;
 }
 
-/// What the library and the judge disagree about after some operation, or "".
-std::string Difference(Operations const& operations)
+std::string AgainstPlainSteps(Operations const& operations)
 {
-    std::array<GrRegion, kRegions> ours;
-    std::array<GrRegion, kRegions> theirs;
+    Regions<GrRegion> ours;
+    Regions<PlainRegion> theirs;
     TakeAssertions();
-    judge::TakeReports();
+    PlainRegion::TakeReports();
     for (Operation const& o : operations) {
-        ByLibrary(ours, o);
-        ByJudge(theirs, o);
-        auto const target = static_cast<std::size_t>(o.target);
-        auto const state = [target](auto const& regions, auto const& reports) {
-            std::string text =
-                BandsText(regions[target]) + "\n  capacities " + CapacitiesText(regions[target]) + "\n";
-            for (std::string const& report : reports)
-                text += "  " + report + "\n";
-            return text;
-        };
-        std::string const we = state(ours, TakeAssertions());
-        std::string const they = state(theirs, judge::TakeReports());
+        GrRegion const& our = Perform(ours, o);
+        GrRegion const& their = Perform(theirs, o);
+        std::string const we = State(our, TakeAssertions());
+        std::string const they = State(their, PlainRegion::TakeReports());
         if (we != they) return std::string("library: ").append(we).append("judge:   ").append(they);
-        if (ours[target].bands.item_count > kMostBands) {
-            ours[target].Clear();
-            theirs[target].Clear();
-        }
     }
     return "";
 }
 
+constexpr int kSide = 48, kLeast = -8;
+using Pixels = std::bitset<kSide * kSide>;
+
+Pixels PixelsOf(GrRegion const& region)
+{
+    Pixels pixels;
+    for (int i = 0; i < region.bands.item_count; ++i)
+        for (int k = 0; k < region.bands.items[i].item_count; ++k)
+            for (int y = region.bands.items[i].r1; y < region.bands.items[i].r2; ++y)
+                for (int x = region.bands.items[i].items[k].r1; x < region.bands.items[i].items[k].r2; ++x)
+                    pixels.set(static_cast<std::size_t>((y - kLeast) * kSide + x - kLeast));
+    return pixels;
+}
+
+/// True if the bands do not follow one on the other, so that merges no longer promise sets of pixels.
+bool HasHole(GrRegion const& region)
+{
+    for (int i = 1; i < region.bands.item_count; ++i)
+        if (GrRegion::Band const* b = &region.bands.items[i]; b->r1 >= b->r2 || b[-1].r2 != b->r1)
+            return true;
+    return false;
+}
+
+int judgedByPixels = 0;
+
+std::string AgainstPixels(Operations const& operations)
+{
+    Regions<GrRegion> regions;
+    for (Operation const& o : operations) {
+        GrRegion& target = regions.at(static_cast<std::size_t>(o.target));
+        bool const withRegion = std::string("usi").find(o.kind) != std::string::npos;
+        GrRegion const other(withRegion ? regions.at(static_cast<std::size_t>(o.other)) : GrRegion(o.rect));
+        if (HasHole(target)) target = GrRect{0, 0, 20, 20};
+        Pixels const a = PixelsOf(target), b = PixelsOf(other);
+        bool const unites = o.kind == '+' || o.kind == 'u', subtracts = o.kind == '-' || o.kind == 's';
+        Pixels const expected = unites ? a | b : subtracts ? a & ~b : a & b;
+        Perform(regions, o);
+        if (HasHole(other)) continue;
+        ++judgedByPixels;
+        if (PixelsOf(target) != expected) return "wrong pixels: " + BandsText(target);
+        for (int i = 0; i < kSide * kSide; ++i)
+            if (target.Contains(i % kSide + kLeast, i / kSide + kLeast) !=
+                expected[static_cast<std::size_t>(i)])
+                return "Contains: " + BandsText(target);
+    }
+    return "";
+}
+
+/// A cut has the bands of a copy that is intersected, and is made in storage with traces of earlier ones.
+std::string CutAgainstCopy(Operations const& operations)
+{
+    Regions<GrRegion> regions;
+    GrRegion cut;
+    for (Operation const& o : operations) {
+        GrRegion const& region = Perform(regions, o);
+        GrRegion const& other = regions.at(static_cast<std::size_t>(o.other));
+        for (bool const byRect : {false, true}) {
+            GrRegion expected(region);
+            byRect ? expected &= o.rect : expected &= other;
+            byRect ? CutRegion(cut, region, o.rect) : CutRegion(cut, region, other);
+            if (expected ? BandsText(cut) != BandsText(expected) : static_cast<bool>(cut))
+                return BandsText(region) + " was cut to " + BandsText(cut);
+        }
+    }
+    TakeAssertions();
+    return "";
+}
+
 /// Leaves out operations, in ever smaller pieces, as long as the list still fails.
-Operations Shrunk(Operations operations, std::function<std::string(Operations const&)> const& failure)
+Operations Shrunk(Operations operations, Judge& judge)
 {
     for (std::size_t piece = operations.size(); piece > 0; piece /= 2) {
         for (std::size_t at = 0; at + piece <= operations.size();) {
             Operations fewer = operations;
             auto const first = fewer.begin() + static_cast<std::ptrdiff_t>(at);
             fewer.erase(first, first + static_cast<std::ptrdiff_t>(piece));
-            if (failure(fewer).empty())
+            if (judge(fewer).empty())
                 at += piece;
             else
                 operations = fewer;
@@ -135,138 +161,52 @@ Operations Shrunk(Operations operations, std::function<std::string(Operations co
     return operations;
 }
 
-/// Runs lists of operations until `total` have been done; `span` is the extent of coordinates.
-void ExpectNoFailure(int total, std::vector<int> const& lengths, std::vector<int> const& spans,
-    std::vector<int> const& kinds, std::function<std::string(Operations const&)> const& failure)
+/// Judges lists of operations until `total` have been done. A kind comes as often as it stands in `kinds`; a
+/// span is the extent of coordinates.
+void JudgeLists(int total, std::vector<int> const& lengths, std::vector<int> const& spans,
+    std::string const& kinds, Judge& judge)
 {
+    CollectAssertions();
+    EXPECT_EQ(judge(kReplay), "");
     std::uint32_t const seed = std::random_device{}();
     std::printf("seed %u\n", seed);
     std::mt19937 random(seed);
-    auto const below = [&random](int n) { return static_cast<int>(random() % static_cast<unsigned>(n)); };
+    auto const below = [&](auto n) { return static_cast<int>(random() % static_cast<unsigned>(n)); };
+    auto const oneOf = [&](auto const& list) { return list[static_cast<std::size_t>(below(list.size()))]; };
     for (int done = 0; done < total;) {
-        int const length = lengths[static_cast<std::size_t>(below(static_cast<int>(lengths.size())))];
-        int const span = spans[static_cast<std::size_t>(below(static_cast<int>(spans.size())))];
-        int const largest = 1 + below(span);
-        Operations operations;
-        for (int i = 0; i < length; ++i) {
-            auto const kind =
-                static_cast<Kind>(kinds[static_cast<std::size_t>(below(static_cast<int>(kinds.size())))]);
-            int const x = below(span) - span / 4;
-            int const y = below(span) - span / 4;
-            operations.push_back(
-                {kind, below(kRegions), below(kRegions), {x, y, x + below(largest), y + below(largest)}});
-            if (kind == Move) operations.back().rect = {below(7) - 3, below(7) - 3, 0, 0};
+        int const span = oneOf(spans), largest = 1 + below(span);
+        Operations operations(static_cast<std::size_t>(oneOf(lengths)));
+        for (Operation& o : operations) {
+            int const x = below(span) - span / 4, y = below(span) - span / 4;
+            o = {oneOf(kinds), below(3), below(3), {x, y, x + below(largest), y + below(largest)}};
+            if (o.kind == 'm') o.rect = {below(7) - 3, below(7) - 3, 0, 0};
         }
-        if (!failure(operations).empty()) {
-            Operations const few = Shrunk(operations, failure);
-            FAIL() << "seed " << seed << "\n" << Text(few) << failure(few);
-        }
-        done += length;
+        done += static_cast<int>(operations.size());
+        if (judge(operations).empty()) continue;
+        std::ostringstream text;
+        operations = Shrunk(operations, judge);
+        for (auto const& [kind, target, other, rect] : operations)
+            text << "    {'" << kind << "', " << target << ", " << other << ", {" << rect.x1 << ", "
+                 << rect.y1 << ", " << rect.x2 << ", " << rect.y2 << "}},\n";
+        FAIL() << "seed " << seed << "\n" << text.str() << judge(operations);
     }
 }
-
-/// The pixels of a region, row by row.
-using Pixels = std::set<std::pair<int, int>>;
-
-Pixels PixelsOf(GrRect const& rect)
-{
-    Pixels pixels;
-    for (int y = rect.y1; y < rect.y2; ++y)
-        for (int x = rect.x1; x < rect.x2; ++x)
-            pixels.emplace(y, x);
-    return pixels;
-}
-
-Pixels PixelsOf(GrRegion const& region)
-{
-    Pixels pixels;
-    for (int i = 0; i < region.bands.item_count; ++i) {
-        GrRegion::Band const& band = region.bands.items[i];
-        for (int k = 0; k < band.item_count; ++k)
-            pixels.merge(PixelsOf(GrRect{band.items[k].r1, band.r1, band.items[k].r2, band.r2}));
-    }
-    return pixels;
-}
-
-/// True if the bands do not follow one on the other, so that merges no longer promise sets of pixels.
-bool HasHole(GrRegion const& region)
-{
-    for (int i = 0; i < region.bands.item_count; ++i) {
-        GrRegion::Band const& band = region.bands.items[i];
-        if (band.r1 >= band.r2 || (i > 0 && (&band)[-1].r2 != band.r1)) return true;
-    }
-    return false;
-}
-
-int judgedByPixels = 0;
-
-/// As above, with sets of pixels as the judge. Operations with regions that have a vertical hole are not
-/// judged.
-std::string PixelDifference(Operations const& operations)
-{
-    std::array<GrRegion, kRegions> regions;
-    for (Operation const& o : operations) {
-        GrRegion& target = regions[static_cast<std::size_t>(o.target)];
-        bool const withRegion = o.kind == AddRegion || o.kind == SubtractRegion || o.kind == IntersectRegion;
-        GrRegion const other = withRegion ? regions[static_cast<std::size_t>(o.other)] : GrRegion(o.rect);
-        if (HasHole(target)) target = GrRect{0, 0, 20, 20};
-        Pixels expected;
-        Pixels const a = PixelsOf(target);
-        Pixels const b = PixelsOf(other);
-        auto const into = std::inserter(expected, expected.end());
-        switch (o.kind) {
-        case AddRect:
-        case AddRegion: std::set_union(a.begin(), a.end(), b.begin(), b.end(), into); break;
-        case SubtractRect:
-        case SubtractRegion: std::set_difference(a.begin(), a.end(), b.begin(), b.end(), into); break;
-        default: std::set_intersection(a.begin(), a.end(), b.begin(), b.end(), into); break;
-        }
-        ByLibrary(regions, o);
-        if (HasHole(other)) continue;
-        ++judgedByPixels;
-        if (PixelsOf(target) != expected) return "wrong pixels: " + BandsText(target) + "\n";
-        GrRect outer{};
-        target.GetOuterRect(outer);
-        for (int y = outer.y1 - 1; y <= outer.y2; ++y)
-            for (int x = outer.x1 - 1; x <= outer.x2; ++x)
-                if (target.Contains(x, y) != expected.contains({y, x}))
-                    return "Contains: " + BandsText(target) + "\n";
-        int x = 0;
-        int y = 0;
-        target.GetSomePoint(x, y);
-        if (target ? std::pair(y, x) != *expected.begin() : x != 0 || y != 0 || !expected.empty())
-            return "GetSomePoint: " + BandsText(target) + "\n";
-    }
-    return "";
-}
-
-constexpr int kEveryKind[] = {AddRect, AddRect, AddRect, SubtractRect, SubtractRect, IntersectRect, AddRegion,
-    SubtractRegion, SubtractRegion, IntersectRegion, SetRect, SetRegion, Move, Clear};
-constexpr int kMostlyRects[] = {AddRect, AddRect, AddRect, AddRect, AddRect, AddRect, SubtractRect,
-    SubtractRect, SubtractRect, AddRegion, SubtractRegion, SetRegion, Move, Move, Move, Move};
-constexpr int kMerges[] = {
-    AddRect, AddRect, SubtractRect, IntersectRect, AddRegion, SubtractRegion, IntersectRegion};
 
 }
 
 TEST(RegionRandom, MergesEqualThePlainSteps)
 {
-    CollectAssertions();
-    EXPECT_EQ(Difference(kReplay), "");
-    ExpectNoFailure(
-        200'000, {5, 20, 60}, {6, 12, 40}, {std::begin(kEveryKind), std::end(kEveryKind)}, Difference);
-}
-
-TEST(RegionRandom, LargeListsEqualThePlainSteps)
-{
-    CollectAssertions();
-    ExpectNoFailure(
-        20'000, {200, 1000}, {100, 400}, {std::begin(kMostlyRects), std::end(kMostlyRects)}, Difference);
+    JudgeLists(200'000, {5, 20, 60}, {6, 12, 40}, "+++--&ussi=amc", AgainstPlainSteps);
+    JudgeLists(20'000, {200, 1000}, {100, 400}, "++++++---usammmm", AgainstPlainSteps);
 }
 
 TEST(RegionRandom, MergesEqualSetsOfPixels)
 {
-    CollectAssertions();
-    ExpectNoFailure(20'000, {10, 40}, {8, 20}, {std::begin(kMerges), std::end(kMerges)}, PixelDifference);
+    JudgeLists(20'000, {10, 40}, {8, 20}, "++-&usi", AgainstPixels);
     EXPECT_GT(judgedByPixels, 10'000);
+}
+
+TEST(RegionRandom, CutsEqualIntersectedCopies)
+{
+    JudgeLists(40'000, {5, 20}, {12, 40}, "+++--&ussi=am", CutAgainstCopy);
 }

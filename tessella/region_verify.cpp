@@ -29,35 +29,41 @@ Band const* FirstImperfectPlain(Band const* band, Band const* end, int above)
 
 #ifdef __x86_64__
 /// Ends that are compared at a time, each with the one after it; even, so that an r1 comes first.
-static constexpr int kPairs = 14;
+static constexpr int kPairs = 8;
 
-/// Of `pairs` ends, at most 14, those that are not before the one after them. All 14 if `pairs` is -1.
-[[gnu::target("avx512f,bmi2")]] inline static unsigned WrongPairs(int const* ends, int pairs)
+/// Of the first `pairs` ends, those that are not before the one after them.
+[[gnu::target("avx512f,avx512vl")]] inline static unsigned WrongPairs(int const* ends, __mmask8 pairs)
 {
-    __m512i const mayTouch = _mm512_set1_epi64(1LL << 32);  // an r2 may equal the r1 after it
-    auto const ofPairs = static_cast<__mmask16>(_bzhi_u32((1U << kPairs) - 1, static_cast<unsigned>(pairs)));
-    auto const ofEnds = static_cast<__mmask16>(2 * ofPairs + 1);
-    __m512i const here = _mm512_maskz_loadu_epi32(ofEnds, ends);
-    __m512i const next = _mm512_maskz_alignr_epi32(ofPairs, here, here, 1);
-    return _mm512_mask_cmple_epi32_mask(ofPairs, next, _mm512_sub_epi32(here, mayTouch));
+    __m256i const mayTouch = _mm256_set1_epi64x(1LL << 32);  // an r2 may equal the r1 after it
+    __m256i const here = _mm256_maskz_loadu_epi32(pairs, ends);
+    __m256i const next = _mm256_maskz_loadu_epi32(pairs, ends + 1);
+    return _mm256_mask_cmple_epi32_mask(pairs, next, _mm256_sub_epi32(here, mayTouch));
 }
 
-[[gnu::target("avx512f,bmi2")]] Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
+// How many ranges the next band has is hard to foresee: up to four take the same path, and so does none, for
+// which nothing is read.
+[[gnu::target("avx512f,avx512vl,bmi2")]] Band const* FirstImperfectWide(
+    Band const* band, Band const* end, int above)
 {
-    static constexpr int kPerfect[kPairs + 1] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14};
+    constexpr unsigned kAll = (1U << kPairs) - 1;
     for (; band != end; ++band) {
         if (band->r1 < above || band->r1 >= band->r2) return band;
         above = band->r1;
-        int const* ends = band->item_count > 0 ? &band->items->r1 : kPerfect;
-        int pairs = 2 * band->item_count - 1;
-        for (; pairs > kPairs; pairs -= kPairs, ends += kPairs)
-            if (WrongPairs(ends, kPairs) != 0) return band;
-        if (WrongPairs(ends, pairs) != 0) return band;
+        int const* ends = band->items != nullptr ? &band->items->r1 : &band->r1;
+        int count = 2 * band->item_count;
+        for (; count > kPairs; count -= kPairs, ends += kPairs)
+            if (WrongPairs(ends, kAll) != 0) return band;
+        unsigned const pairs = _bzhi_u32(kAll, static_cast<unsigned>(count)) >> 1;
+        if (WrongPairs(ends, static_cast<__mmask8>(pairs)) != 0) return band;
     }
     return end;
 }
 
-bool WideRegistersPresent() { return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("bmi2"); }
+bool WideRegistersPresent()
+{
+    return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512vl") &&
+        __builtin_cpu_supports("bmi2");
+}
 #else
 Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
 {

@@ -26,12 +26,22 @@ template <typename T>
 void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
 {
     if (count <= 0) return;
+    // Nearly always a few; a call costs more than such moves.
+    constexpr std::size_t kPair = 2 * sizeof(T);
     void const* const source = from;
-    if (count == 1)
-        std::memcpy(
-            static_cast<void*>(to), source, sizeof(T));  // most often; a call costs more than the move
-    else
+    if (count == 1) {
+        std::memcpy(static_cast<void*>(to), source, sizeof(T));
+    } else if (count <= 4) {
+        unsigned char firstPair[kPair];
+        unsigned char lastPair[kPair];
+        void const* const lastSource = from + count - 2;
+        std::memcpy(firstPair, source, kPair);
+        std::memcpy(lastPair, lastSource, kPair);
+        std::memcpy(static_cast<void*>(to), firstPair, kPair);
+        std::memcpy(static_cast<void*>(to + count - 2), lastPair, kPair);
+    } else {
         std::memmove(static_cast<void*>(to), source, static_cast<std::size_t>(count) * sizeof(T));
+    }
 }
 
 /// Makes the slots bands that own nothing.
@@ -153,9 +163,9 @@ inline void Assign(GrRegion::Band& result, GrRegion::Band const& band)
 inline bool SameRanges(GrRegion::Band const& a, GrRegion::Band const& b)
 {
     if (a.item_count != b.item_count) return false;
-    if (a.item_count == 0) return true;
-    return a.items[0] == b.items[0] &&
-        std::memcmp(a.items, b.items, static_cast<std::size_t>(a.item_count) * sizeof(GrRange)) == 0;
+    for (int i = 0; i < a.item_count; ++i)
+        if (!(a.items[i] == b.items[i])) return false;
+    return true;
 }
 
 /// `result` = `band`, followed by `AddBand`, `RemoveBand` or `IntersectBand` with `other`: the ranges and the

@@ -20,6 +20,18 @@ constexpr int GrownCapacity(int capacity, int need)
     return need <= capacity ? capacity : capacity + (need - capacity + kGrowth - 1) / kGrowth * kGrowth;
 }
 
+/// Single slots, field by field: one field has often just been written, and a wider read would wait for it.
+inline void MoveSlot(GrRange& to, GrRange const& from) { to = from; }
+
+inline void MoveSlot(GrRegion::Band& to, GrRegion::Band const& from)
+{
+    to.r1 = from.r1;
+    to.r2 = from.r2;
+    to.items = from.items;
+    to.item_count = from.item_count;
+    to.item_capacity = from.item_capacity;
+}
+
 /// Block moves of slots. A band moves with its storage: the slot it leaves must be overwritten, or a copy of
 /// a slot that was saved before must go somewhere, so that each range array keeps exactly one owner.
 template <typename T>
@@ -30,7 +42,7 @@ void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
     constexpr std::size_t kPair = 2 * sizeof(T);
     void const* const source = from;
     if (count == 1) {
-        std::memcpy(static_cast<void*>(to), source, sizeof(T));
+        MoveSlot(*to, *from);
     } else if (count <= 4) {
         unsigned char firstPair[kPair];
         unsigned char lastPair[kPair];
@@ -83,6 +95,9 @@ void Resize(GrItemArray<T>& list, int capacity)
     list.item_capacity = capacity;
 }
 
+/// Of a sum that is not negative.
+constexpr int Half(int sum) { return static_cast<int>(static_cast<unsigned>(sum) / 2); }
+
 /// The first entry that ends after `v`, or `item_count`.
 template <typename T>
 int FirstEndingAfter(GrItemArray<T> const& list, int v)
@@ -90,7 +105,7 @@ int FirstEndingAfter(GrItemArray<T> const& list, int v)
     int lo = 0;
     int hi = list.item_count;
     while (lo < hi) {
-        int const mid = (lo + hi) / 2;
+        int const mid = Half(lo + hi);
         if (v >= list.items[mid].r2)
             lo = mid + 1;
         else
@@ -106,7 +121,7 @@ int LastStartingBy(GrItemArray<T> const& list, int v)
     int lo = -1;
     int hi = list.item_count - 1;
     while (lo < hi) {
-        int const mid = (lo + hi + 1) / 2;
+        int const mid = Half(lo + hi + 1);
         if (v < list.items[mid].r1)
             hi = mid - 1;
         else

@@ -1,5 +1,6 @@
 #include <tessella/region_storage.h>
 
+#include <cstdint>
 #include <limits>
 
 #ifdef __x86_64__
@@ -28,41 +29,44 @@ Band const* FirstImperfectPlain(Band const* band, Band const* end, int above)
 }
 
 #ifdef __x86_64__
-/// Ends that are compared at a time, each with the one after it; even, so that an r1 comes first.
-static constexpr int kPairs = 8;
+/// Ranges whose ends are compared at a time, each with the one after it.
+static constexpr int kRanges = 4;
 
-/// Of the first `pairs` ends, those that are not before the one after them.
-[[gnu::target("avx512f,avx512vl")]] inline static unsigned WrongPairs(int const* ends, __mmask8 pairs)
+/// Of the ends of up to four ranges, which ones another one follows.
+static constexpr std::uint8_t kFollowed[kRanges + 1] = {0, 0b1, 0b111, 0b11111, 0b1111111};
+
+/// True if one of the ends that `followed` tells is not before the one after it.
+[[gnu::target("avx512dq,avx512vl")]] inline static bool Disordered(int const* ends, __mmask8 followed)
 {
     __m256i const mayTouch = _mm256_set1_epi64x(1LL << 32);  // an r2 may equal the r1 after it
-    __m256i const here = _mm256_maskz_loadu_epi32(pairs, ends);
-    __m256i const next = _mm256_maskz_loadu_epi32(pairs, ends + 1);
-    return _mm256_mask_cmple_epi32_mask(pairs, next, _mm256_sub_epi32(here, mayTouch));
+    __m256i const here = _mm256_maskz_loadu_epi32(followed, ends);
+    __m256i const next = _mm256_maskz_loadu_epi32(followed, ends + 1);
+    __mmask8 const wrong = _mm256_mask_cmple_epi32_mask(followed, next, _mm256_sub_epi32(here, mayTouch));
+    return _kortestz_mask8_u8(wrong, wrong) == 0;
 }
 
 // How many ranges the next band has is hard to foresee: up to four take the same path, and so does none, for
 // which nothing is read.
-[[gnu::target("avx512f,avx512vl,bmi2")]] Band const* FirstImperfectWide(
+[[gnu::target("avx512dq,avx512vl")]] Band const* FirstImperfectWide(
     Band const* band, Band const* end, int above)
 {
-    constexpr unsigned kAll = (1U << kPairs) - 1;
     for (; band != end; ++band) {
         if (band->r1 < above || band->r1 >= band->r2) return band;
         above = band->r1;
         int const* ends = band->items != nullptr ? &band->items->r1 : &band->r1;
-        int count = 2 * band->item_count;
-        for (; count > kPairs; count -= kPairs, ends += kPairs)
-            if (WrongPairs(ends, kAll) != 0) return band;
-        unsigned const pairs = _bzhi_u32(kAll, static_cast<unsigned>(count)) >> 1;
-        if (WrongPairs(ends, static_cast<__mmask8>(pairs)) != 0) return band;
+        int count = band->item_count;
+        if (count > kRanges) [[unlikely]] {
+            for (; count > kRanges; count -= kRanges, ends += 2 * kRanges)
+                if (Disordered(ends, 0xFF)) return band;
+        }
+        if (Disordered(ends, kFollowed[std::max(count, 0)])) return band;
     }
     return end;
 }
 
 bool WideRegistersPresent()
 {
-    return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512vl") &&
-        __builtin_cpu_supports("bmi2");
+    return __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512vl");
 }
 #else
 Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
@@ -89,23 +93,33 @@ bool VerifyBand(Band const& band)
     return true;
 }
 
+Band const* FirstImperfect(Band const* band, Band const* end, int above)
+{
+    return WideRegistersPresent() ? FirstImperfectWide(band, end, above)
+                                  : FirstImperfectPlain(band, end, above);
+}
+
+/// Judges `item`, the first imperfect band, and those after it.
+bool VerifyFrom(Band const* item, GrItemArray<Band> const& bands)
+{
+    Band const* const end = EndOf(bands);
+    while (item != end) {
+        int const previous = item == bands.items ? 0 : item[-1].r1;
+        if (item->r1 >= item->r2) return GR_ASSERT_TEXT(false, "false");
+        if (previous != 0 && item->r1 < previous) return GR_ASSERT_TEXT(false, "false");
+        GR_ASSERT(VerifyBand(*item));
+        item = FirstImperfect(item + 1, end, item->r1);
+    }
+    return true;
+}
+
 }
 
 bool VerifyRegion(GrRegion const& region)
 {
     Band const* const end = EndOf(region.bands);
-    auto* const firstImperfect = WideRegistersPresent() ? FirstImperfectWide : FirstImperfectPlain;
-    int previous = std::numeric_limits<int>::min();
-    for (Band const* item = region.bands.items; item != end; ++item) {
-        item = firstImperfect(item, end, previous);
-        if (item == end) break;
-        previous = item == region.bands.items ? 0 : item[-1].r1;
-        if (item->r1 >= item->r2) return GR_ASSERT_TEXT(false, "false");
-        if (previous != 0 && item->r1 < previous) return GR_ASSERT_TEXT(false, "false");
-        GR_ASSERT(VerifyBand(*item));
-        previous = item->r1;
-    }
-    return true;
+    Band const* const imperfect = FirstImperfect(region.bands.items, end, std::numeric_limits<int>::min());
+    return imperfect == end || VerifyFrom(imperfect, region.bands);
 }
 
 void CheckRegion(GrRegion const& region) { GR_ASSERT_TEXT(VerifyRegion(region), "VerifyRegion(*this)"); }

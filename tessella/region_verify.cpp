@@ -54,12 +54,14 @@ static constexpr std::uint8_t kFollowed[kRanges + 1] = {0, 0b1, 0b111, 0b11111, 
         if (band->r1 < above || band->r1 >= band->r2) return band;
         above = band->r1;
         int const* ends = band->items != nullptr ? &band->items->r1 : &band->r1;
-        int count = band->item_count;
-        if (count > kRanges) [[unlikely]] {
+        auto ranges = static_cast<unsigned>(band->item_count);
+        if (ranges > kRanges) [[unlikely]] {
+            int count = band->item_count;
             for (; count > kRanges; count -= kRanges, ends += 2 * kRanges)
                 if (Disordered(ends, 0xFF)) return band;
+            ranges = static_cast<unsigned>(std::max(count, 0));
         }
-        if (Disordered(ends, kFollowed[std::max(count, 0)])) return band;
+        if (Disordered(ends, kFollowed[ranges])) return band;
     }
     return end;
 }

@@ -175,7 +175,8 @@ private:
         if (from - to < kGrowth) {
             std::ptrdiff_t const written = to - begin;
             std::ptrdiff_t const size = written + kGrowth + following + unread;
-            Band* const larger = NewSlots(list, static_cast<int>(size));
+            // Not zeroed: slots count only once they have been moved to, or zeroed below.
+            Band* const larger = new Band[static_cast<std::size_t>(size)];
             MoveSlots(larger, begin, written);
             MoveSlots(larger + size - unread, from, unread);
             delete[] begin;

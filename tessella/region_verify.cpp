@@ -102,7 +102,7 @@ Band const* FirstImperfect(Band const* band, Band const* end, int above)
 }
 
 /// Judges `item`, the first imperfect band, and those after it.
-bool VerifyFrom(Band const* item, GrItemArray<Band> const& bands)
+[[gnu::cold]] bool VerifyFrom(Band const* item, GrItemArray<Band> const& bands)
 {
     Band const* const end = EndOf(bands);
     while (item != end) {

@@ -92,7 +92,7 @@ private:
     class SavedSlots {
     public:
         static constexpr int kMost = 16;
-        static constexpr int kFew = 8;  // up to so many bands move faster one by one
+        static constexpr int kFew = 14;  // up to so many bands move faster one by one
         void Save(Band const* slots, int count)
         {
             std::memcpy(bytes, static_cast<void const*>(slots), Size(count));

@@ -147,6 +147,8 @@ bool DebuggerAttached()
 
 [[gnu::noinline]] int AssertFailed(char const* expression, char const* file, unsigned line)
 {
+    KeepErrno const keepErrno;
+    if (Settings().flags == AssertOff) return 0;  // spares writing a text that nobody reads
     std::array<char, 540> text;
     int const length = std::snprintf(text.data(), text.size(), "Assertion failed: %s, file %s, line %d",
         expression, file, static_cast<int>(line));

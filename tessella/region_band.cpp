@@ -36,15 +36,22 @@ private:
     std::unique_ptr<GrRange[]> many;
 };
 
-/// The ranges `first` to `last` - 1 of `band`: all that `other` can touch. `other` has ranges.
-struct Window {
-    Window(Band const& band, Band const& other)
-        : first(FirstEndingAfter(band, other.items[0].r1)),
-          last(std::max(first, LastStartingBy(band, other.items[other.item_count - 1].r2 - 1) + 1)),
-          buffer(last - first + other.item_count)
+/// The ranges `first` to `last` - 1 of `band`: all that the pixels `from` to `to` - 1 can touch.
+struct Span {
+    Span(Band const& band, int from, int to)
+        : first(FirstEndingAfter(band, from)), last(std::max(first, LastStartingBy(band, to - 1) + 1))
     {}
 
     int first, last;
+};
+
+/// The same for all that `other`, which has ranges, can touch, and room for what is made of them.
+struct Window : Span {
+    Window(Band const& band, Band const& other)
+        : Span(band, other.items[0].r1, other.items[other.item_count - 1].r2),
+          buffer(last - first + other.item_count)
+    {}
+
     RangeBuffer buffer;
 };
 
@@ -76,6 +83,35 @@ void Splice(Band& result, Band const& band, int first, int last, GrRange const* 
     result.item_count = first + count + tail;
 }
 
+/// The union with one range, which is all that a rectangle brings.
+void SpliceUnion(Band& result, Band const& band, GrRange joined)
+{
+    Span const span(band, joined.r1, joined.r2);
+    int next = span.first;
+    for (; next != span.last && band.items[next].r1 < joined.r2; ++next) {
+        joined.r1 = std::min(joined.r1, band.items[next].r1);
+        joined.r2 = std::max(joined.r2, band.items[next].r2);
+    }
+    int const peak = band.item_count + (next == span.first ? 1 : 0);
+    Splice(result, band, span.first, next, &joined, 1, peak);
+}
+
+/// The difference to one range: of what it touches, the outer ends are left.
+void SpliceDifference(Band& result, Band const& band, GrRange const& cut)
+{
+    Span const span(band, cut.r1, cut.r2);
+    GrRange made[2];
+    int count = 0;
+    if (span.first != span.last) {
+        int const left = band.items[span.first].r1;
+        int const right = band.items[span.last - 1].r2;
+        if (left < cut.r1) made[count++] = {left, cut.r1};
+        if (cut.r2 < right) made[count++] = {cut.r2, right};
+    }
+    int const peak = band.item_count + (count > span.last - span.first ? 1 : 0);
+    Splice(result, band, span.first, span.last, made, count, peak);
+}
+
 /// True if the spans from the first to the last range have a pixel in common. Both bands have ranges.
 bool SpansMeet(Band const& a, Band const& b)
 {
@@ -90,6 +126,7 @@ void AssignUnion(Band& result, Band const& band, Band const& other)
         if (&result != &band) Assign(result, band);
         return;
     }
+    if (other.item_count == 1) return SpliceUnion(result, band, other.items[0]);
     Window window(band, other);
     GrRange* const made = window.buffer.Items();
     GrRange* out = made;
@@ -129,6 +166,7 @@ void AssignDifference(Band& result, Band const& band, Band const& other)
         if (&result != &band) Assign(result, band);
         return;
     }
+    if (other.item_count == 1) return SpliceDifference(result, band, other.items[0]);
     Window window(band, other);
     GrRange* const made = window.buffer.Items();
     GrRange* out = made;

@@ -92,7 +92,7 @@ private:
     class SavedSlots {
     public:
         static constexpr int kMost = 16;
-        static constexpr int kFew = 8;  // up to so many bands move faster one by one
+        static constexpr int kFew = 14;  // up to so many bands move faster one by one
         void Save(Band const* slots, int count)
         {
             std::memcpy(bytes, static_cast<void const*>(slots), Size(count));
@@ -175,7 +175,8 @@ private:
         if (from - to < kGrowth) {
             std::ptrdiff_t const written = to - begin;
             std::ptrdiff_t const size = written + kGrowth + following + unread;
-            Band* const larger = NewSlots(list, static_cast<int>(size));
+            // Not zeroed: slots count only once they have been moved to, or zeroed below.
+            Band* const larger = new Band[static_cast<std::size_t>(size)];
             MoveSlots(larger, begin, written);
             MoveSlots(larger + size - unread, from, unread);
             delete[] begin;

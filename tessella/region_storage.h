@@ -20,18 +20,40 @@ constexpr int GrownCapacity(int capacity, int need)
     return need <= capacity ? capacity : capacity + (need - capacity + kGrowth - 1) / kGrowth * kGrowth;
 }
 
+/// Single slots, field by field: one field has often just been written, and a wider read would wait for it.
+inline void MoveSlot(GrRange& to, GrRange const& from) { to = from; }
+
+inline void MoveSlot(GrRegion::Band& to, GrRegion::Band const& from)
+{
+    to.r1 = from.r1;
+    to.r2 = from.r2;
+    to.items = from.items;
+    to.item_count = from.item_count;
+    to.item_capacity = from.item_capacity;
+}
+
 /// Block moves of slots. A band moves with its storage: the slot it leaves must be overwritten, or a copy of
 /// a slot that was saved before must go somewhere, so that each range array keeps exactly one owner.
 template <typename T>
 void MoveSlots(T* to, T const* from, std::ptrdiff_t count)
 {
     if (count <= 0) return;
+    // Nearly always a few; a call costs more than such moves.
+    constexpr std::size_t kPair = 2 * sizeof(T);
     void const* const source = from;
-    if (count == 1)
-        std::memcpy(
-            static_cast<void*>(to), source, sizeof(T));  // most often; a call costs more than the move
-    else
+    if (count == 1) {
+        MoveSlot(*to, *from);
+    } else if (count <= 4) {
+        unsigned char firstPair[kPair];
+        unsigned char lastPair[kPair];
+        void const* const lastSource = from + count - 2;
+        std::memcpy(firstPair, source, kPair);
+        std::memcpy(lastPair, lastSource, kPair);
+        std::memcpy(static_cast<void*>(to), firstPair, kPair);
+        std::memcpy(static_cast<void*>(to + count - 2), lastPair, kPair);
+    } else {
         std::memmove(static_cast<void*>(to), source, static_cast<std::size_t>(count) * sizeof(T));
+    }
 }
 
 /// Makes the slots bands that own nothing.
@@ -73,6 +95,9 @@ void Resize(GrItemArray<T>& list, int capacity)
     list.item_capacity = capacity;
 }
 
+/// Of a sum that is not negative.
+constexpr int Half(int sum) { return static_cast<int>(static_cast<unsigned>(sum) / 2); }
+
 /// The first entry that ends after `v`, or `item_count`.
 template <typename T>
 int FirstEndingAfter(GrItemArray<T> const& list, int v)
@@ -80,7 +105,7 @@ int FirstEndingAfter(GrItemArray<T> const& list, int v)
     int lo = 0;
     int hi = list.item_count;
     while (lo < hi) {
-        int const mid = (lo + hi) / 2;
+        int const mid = Half(lo + hi);
         if (v >= list.items[mid].r2)
             lo = mid + 1;
         else
@@ -96,7 +121,7 @@ int LastStartingBy(GrItemArray<T> const& list, int v)
     int lo = -1;
     int hi = list.item_count - 1;
     while (lo < hi) {
-        int const mid = (lo + hi + 1) / 2;
+        int const mid = Half(lo + hi + 1);
         if (v < list.items[mid].r1)
             hi = mid - 1;
         else
@@ -153,9 +178,9 @@ inline void Assign(GrRegion::Band& result, GrRegion::Band const& band)
 inline bool SameRanges(GrRegion::Band const& a, GrRegion::Band const& b)
 {
     if (a.item_count != b.item_count) return false;
-    if (a.item_count == 0) return true;
-    return a.items[0] == b.items[0] &&
-        std::memcmp(a.items, b.items, static_cast<std::size_t>(a.item_count) * sizeof(GrRange)) == 0;
+    for (int i = 0; i < a.item_count; ++i)
+        if (!(a.items[i] == b.items[i])) return false;
+    return true;
 }
 
 /// `result` = `band`, followed by `AddBand`, `RemoveBand` or `IntersectBand` with `other`: the ranges and the

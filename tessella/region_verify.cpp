@@ -1,5 +1,6 @@
 #include <tessella/region_storage.h>
 
+#include <cstdint>
 #include <limits>
 
 #ifdef __x86_64__
@@ -28,36 +29,47 @@ Band const* FirstImperfectPlain(Band const* band, Band const* end, int above)
 }
 
 #ifdef __x86_64__
-/// Ends that are compared at a time, each with the one after it; even, so that an r1 comes first.
-static constexpr int kPairs = 14;
+/// Ranges whose ends are compared at a time, each with the one after it.
+static constexpr int kRanges = 4;
 
-/// Of `pairs` ends, at most 14, those that are not before the one after them. All 14 if `pairs` is -1.
-[[gnu::target("avx512f,bmi2")]] inline static unsigned WrongPairs(int const* ends, int pairs)
+/// Of the ends of up to four ranges, which ones another one follows.
+static constexpr std::uint8_t kFollowed[kRanges + 1] = {0, 0b1, 0b111, 0b11111, 0b1111111};
+
+/// True if one of the ends that `followed` tells is not before the one after it.
+[[gnu::target("avx512dq,avx512vl")]] inline static bool Disordered(int const* ends, __mmask8 followed)
 {
-    __m512i const mayTouch = _mm512_set1_epi64(1LL << 32);  // an r2 may equal the r1 after it
-    auto const ofPairs = static_cast<__mmask16>(_bzhi_u32((1U << kPairs) - 1, static_cast<unsigned>(pairs)));
-    auto const ofEnds = static_cast<__mmask16>(2 * ofPairs + 1);
-    __m512i const here = _mm512_maskz_loadu_epi32(ofEnds, ends);
-    __m512i const next = _mm512_maskz_alignr_epi32(ofPairs, here, here, 1);
-    return _mm512_mask_cmple_epi32_mask(ofPairs, next, _mm512_sub_epi32(here, mayTouch));
+    __m256i const mayTouch = _mm256_set1_epi64x(1LL << 32);  // an r2 may equal the r1 after it
+    __m256i const here = _mm256_maskz_loadu_epi32(followed, ends);
+    __m256i const next = _mm256_maskz_loadu_epi32(followed, ends + 1);
+    __mmask8 const wrong = _mm256_mask_cmple_epi32_mask(followed, next, _mm256_sub_epi32(here, mayTouch));
+    return _kortestz_mask8_u8(wrong, wrong) == 0;
 }
 
-[[gnu::target("avx512f,bmi2")]] Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
+// How many ranges the next band has is hard to foresee: up to four take the same path, and so does none, for
+// which nothing is read.
+[[gnu::target("avx512dq,avx512vl")]] Band const* FirstImperfectWide(
+    Band const* band, Band const* end, int above)
 {
-    static constexpr int kPerfect[kPairs + 1] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14};
     for (; band != end; ++band) {
         if (band->r1 < above || band->r1 >= band->r2) return band;
         above = band->r1;
-        int const* ends = band->item_count > 0 ? &band->items->r1 : kPerfect;
-        int pairs = 2 * band->item_count - 1;
-        for (; pairs > kPairs; pairs -= kPairs, ends += kPairs)
-            if (WrongPairs(ends, kPairs) != 0) return band;
-        if (WrongPairs(ends, pairs) != 0) return band;
+        int const* ends = band->items != nullptr ? &band->items->r1 : &band->r1;
+        auto ranges = static_cast<unsigned>(band->item_count);
+        if (ranges > kRanges) [[unlikely]] {
+            int count = band->item_count;
+            for (; count > kRanges; count -= kRanges, ends += 2 * kRanges)
+                if (Disordered(ends, 0xFF)) return band;
+            ranges = static_cast<unsigned>(std::max(count, 0));
+        }
+        if (Disordered(ends, kFollowed[ranges])) return band;
     }
     return end;
 }
 
-bool WideRegistersPresent() { return __builtin_cpu_supports("avx512f") && __builtin_cpu_supports("bmi2"); }
+bool WideRegistersPresent()
+{
+    return __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512vl");
+}
 #else
 Band const* FirstImperfectWide(Band const* band, Band const* end, int above)
 {
@@ -83,23 +95,33 @@ bool VerifyBand(Band const& band)
     return true;
 }
 
+Band const* FirstImperfect(Band const* band, Band const* end, int above)
+{
+    return WideRegistersPresent() ? FirstImperfectWide(band, end, above)
+                                  : FirstImperfectPlain(band, end, above);
+}
+
+/// Judges `item`, the first imperfect band, and those after it.
+[[gnu::cold]] bool VerifyFrom(Band const* item, GrItemArray<Band> const& bands)
+{
+    Band const* const end = EndOf(bands);
+    while (item != end) {
+        int const previous = item == bands.items ? 0 : item[-1].r1;
+        if (item->r1 >= item->r2) return GR_ASSERT_TEXT(false, "false");
+        if (previous != 0 && item->r1 < previous) return GR_ASSERT_TEXT(false, "false");
+        GR_ASSERT(VerifyBand(*item));
+        item = FirstImperfect(item + 1, end, item->r1);
+    }
+    return true;
+}
+
 }
 
 bool VerifyRegion(GrRegion const& region)
 {
     Band const* const end = EndOf(region.bands);
-    auto* const firstImperfect = WideRegistersPresent() ? FirstImperfectWide : FirstImperfectPlain;
-    int previous = std::numeric_limits<int>::min();
-    for (Band const* item = region.bands.items; item != end; ++item) {
-        item = firstImperfect(item, end, previous);
-        if (item == end) break;
-        previous = item == region.bands.items ? 0 : item[-1].r1;
-        if (item->r1 >= item->r2) return GR_ASSERT_TEXT(false, "false");
-        if (previous != 0 && item->r1 < previous) return GR_ASSERT_TEXT(false, "false");
-        GR_ASSERT(VerifyBand(*item));
-        previous = item->r1;
-    }
-    return true;
+    Band const* const imperfect = FirstImperfect(region.bands.items, end, std::numeric_limits<int>::min());
+    return imperfect == end || VerifyFrom(imperfect, region.bands);
 }
 
 void CheckRegion(GrRegion const& region) { GR_ASSERT_TEXT(VerifyRegion(region), "VerifyRegion(*this)"); }

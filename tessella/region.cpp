@@ -3,9 +3,10 @@
 
 using Band = GrRegion::Band;
 
-GrRegion::GrRegion(GrRect const& rect) { *this = rect; }
+// The delegation makes the object whole, so that its destructor runs if the assignment throws.
+GrRegion::GrRegion(GrRect const& rect) : GrRegion() { *this = rect; }
 
-GrRegion::GrRegion(GrRegion const& other) { *this = other; }
+GrRegion::GrRegion(GrRegion const& other) : GrRegion() { *this = other; }
 
 GrRegion::~GrRegion() { Clear(); }
 

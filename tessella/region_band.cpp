@@ -2,6 +2,7 @@
 #include <tessella/region_storage.h>
 
 #include <memory>
+#include <new>
 
 // The three merges of range lists share one shape. Where the other band begins and ends is searched for; the
 // ranges of this band in between, the window, are merged with the other's into a buffer; and what was made
@@ -39,7 +40,7 @@ private:
 /// The ranges `first` to `last` - 1 of `band`: all that the pixels `from` to `to` - 1 can touch.
 struct Span {
     Span(Band const& band, int from, int to)
-        : first(FirstEndingAfter(band, from)), last(std::max(first, LastStartingBy(band, to - 1) + 1))
+        : first(FirstEndingAfter(band, from)), last(std::max(first, LastStartingBy(band, Moved(to, -1)) + 1))
     {}
 
     int first, last;
@@ -62,6 +63,7 @@ void Splice(Band& result, Band const& band, int first, int last, GrRange const* 
 {
     int const count = static_cast<int>(madeCount);
     int const tail = band.item_count - last;
+    peak = std::max(peak, first + count + tail);  // damaged lists can make more than any walk foresees
     if (&result == &band) {
         if (peak > result.item_capacity) Resize(result, GrownCapacity(result.item_capacity, peak));
         if (first + count != last) MoveSlots(result.items + first + count, result.items + last, tail);
@@ -238,6 +240,7 @@ void AssignIntersection(Band& result, Band const& band, Band const& other)
 
 void Band::AddRange(int from, int to)
 {
+    if (from >= to) return;
     GrRange range{from, to};
     Band single;
     single.items = &range;
@@ -253,6 +256,8 @@ void Band::IntersectBand(Band const& other) { AssignIntersection(*this, *this, o
 
 void Band::InsertItemAfter(int i)
 {
+    if (i < -1) return;
+    if (i > kMostSlots - 2) throw std::bad_alloc();
     int const need = item_count > i ? item_count + 1 : i + 2;
     if (need > item_capacity) Resize(*this, GrownCapacity(item_capacity, need));
     MoveSlots(items + i + 2, items + i + 1, item_count - i - 1);
@@ -261,10 +266,10 @@ void Band::InsertItemAfter(int i)
 
 void Band::RemoveItems(int from, int to)
 {
-    GR_ASSERT_TEXT(from >= 0, "from>=0");
-    GR_ASSERT_TEXT(to >= from, "to>=from");
-    GR_ASSERT_TEXT(to < item_count, "to<items.item_count");
-    int const tail = std::max(item_count - to - 1, 0);
+    if (!GR_ASSERT_TEXT(from >= 0, "from>=0")) return;
+    if (!GR_ASSERT_TEXT(to >= from, "to>=from")) return;
+    if (!GR_ASSERT_TEXT(to < item_count, "to<items.item_count")) return;
+    int const tail = item_count - to - 1;
     MoveSlots(items + from, items + to + 1, tail);
     item_count = tail + from;
 }

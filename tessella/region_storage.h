@@ -14,6 +14,9 @@ static constexpr char kSource[] = GR_SOURCE("tessella/region");
 /// Lists grow by this many slots.
 constexpr int kGrowth = 10;
 
+/// More than memory holds; counts that stay below it can be calculated with.
+constexpr int kMostSlots = 1 << 30;
+
 /// The recorded capacity after the growth, step by step, that gives room for `need` slots.
 constexpr int GrownCapacity(int capacity, int need)
 {

@@ -36,7 +36,8 @@ ChildOutcome RunWith(char const* settings, char const* logFile, auto body, auto.
 }
 
 // Outside the unnamed namespace and visible, so that stack reports name it. The empty statement keeps the
-// call from being the last thing it does, which would take its frame away; the pointer keeps it from being cloned.
+// call from being the last thing it does, which would take its frame away; the pointer keeps it from being
+// cloned.
 [[gnu::noinline, gnu::visibility("default")]] int FailingPlace(int depth, bool call)
 {
     int result = depth > 0 ? FailingPlace(depth - 1, call) : call ? FailCall() : Fail();

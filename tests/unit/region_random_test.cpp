@@ -202,8 +202,8 @@ TEST(RegionRandom, MergesEqualThePlainSteps)
 
 TEST(RegionRandom, MergesEqualSetsOfPixels)
 {
-    JudgeLists(20'000, {10, 40}, {8, 20}, "++-&usi", AgainstPixels);
-    EXPECT_GT(judgedByPixels, 10'000);
+    JudgeLists(250'000, {10, 40}, {8, 20}, "++-&usi", AgainstPixels);
+    EXPECT_GT(judgedByPixels, 100'000);
 }
 
 TEST(RegionRandom, CutsEqualIntersectedCopies)

@@ -3,7 +3,10 @@
 #include <tessella/region_cut.h>
 #include <tessella/region_storage.h>
 
+#include <array>
 #include <gtest/gtest.h>
+#include <limits>
+#include <new>
 
 #include <thread>
 
@@ -52,6 +55,25 @@ TEST(Region, QueriesSeeHalfOpenIntervalsAndNothingInAnEmptyOne)
     EXPECT_EQ(BandsText(region &= empty), "");
 }
 
+TEST(Region, DamagedRangesDoNotMakeMoreThanThereIsRoomFor)
+{
+    CollectAssertions();
+    GrRegion region = RegionOf("0..1: 0..15");
+    region &= RegionOf("0..1: 0..1 20..2 4..5 20..6 8..9");
+    EXPECT_LE(region.bands.items[0].item_count, region.bands.items[0].item_capacity);
+}
+
+TEST(Region, FieldsLieWhereApplicationsLookForThem)
+{
+    GrRegion::Band band{};
+    auto const offset = [&](auto const& field) {
+        return reinterpret_cast<char const*>(&field) - reinterpret_cast<char const*>(&band);
+    };
+    EXPECT_EQ((std::array{offset(band.r1), offset(band.r2), offset(band.items), offset(band.item_count),
+                  offset(band.item_capacity)}),
+        (std::array<std::ptrdiff_t, 5>{0, 4, 8, 16, 20}));
+}
+
 TEST(Region, ItemsOfABandAreInsertedRemovedAndAssigned)
 {
     CollectAssertions();
@@ -68,10 +90,17 @@ TEST(Region, ItemsOfABandAreInsertedRemovedAndAssigned)
     band.InsertItemAfter(22);
     EXPECT_EQ(std::pair(band.item_count, band.item_capacity), std::pair(24, 33));
     band.item_count = 2;
+    auto const before = BandsText(region);
+    band.RemoveItems(-1, 0);
     band.RemoveItems(1, 0);
-    band.item_count = 2;
     band.RemoveItems(1, 2);
-    EXPECT_EQ(TakeAssertions(), (Strings{"to>=from", "to<items.item_count"}));
+    band.RemoveItems(20, 20);
+    band.InsertItemAfter(-5);
+    band.AddRange(3, 3);
+    EXPECT_EQ(BandsText(region), before) << "misuse changes nothing";
+    EXPECT_EQ(
+        TakeAssertions(), (Strings{"from>=0", "to>=from", "to<items.item_count", "to<items.item_count"}));
+    EXPECT_THROW(band.InsertItemAfter(std::numeric_limits<int>::max()), std::bad_alloc);
     GrRange const* const storage = band.items;
     band = RegionOf("5..7: 4..5 8..9").bands.items[0];
     EXPECT_EQ(BandsText(region), "5..7: 4..5 8..9");

@@ -21,11 +21,12 @@ void GrGenericContextBase<S>::DrawPixel(int x, int y)
 template <typename S>
 void GrGenericContextBase<S>::FillRegion(GrRegion const& region)
 {
-    LocalRegion const moved, cut;
+    LocalRegion const cut;
     GrRegion& local = cut.Get();
     if (this->originX == 0 && this->originY == 0) {
         CutRegion(local, region, this->clip);
     } else {
+        LocalRegion const moved;
         moved.Get() = region;
         moved.Get().Offset(this->originX, this->originY);
         CutRegion(local, moved.Get(), this->clip);

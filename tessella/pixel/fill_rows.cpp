@@ -22,6 +22,9 @@ struct Words {
 // A row is stored in blocks of words, which repeat after three blocks. It is a whole number of pixels, so its
 // last block begins at the third phase whatever the length, and may overlap the block before. Rows shorter
 // than a block are few and narrow; they are stored byte by byte.
+//
+// Blocks that straddle cache lines cost twice. Where all words are equal, the second block moves back to
+// where a line begins, if that is a whole number of pixels and the row is long enough to gain by it.
 GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
 {
     using Block = std::uint32_t __attribute__((vector_size(64)));
@@ -33,11 +36,19 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
     unsigned char* row = rows.address;
     int height = rows.height;
 
+    auto const position = reinterpret_cast<std::uintptr_t>(row) | static_cast<std::uintptr_t>(stride);
+    bool const linesUp =
+        length >= 256 && bytesPerPixel != 3 && position % static_cast<unsigned>(bytesPerPixel) == 0;
+
     auto const fill = [&]<typename Vector>(Vector const& first, Vector const& second, Vector const& third) {
         constexpr std::ptrdiff_t kSize = sizeof(Vector);
         for (; height > 0; --height, row += stride) {
             unsigned char* to = row;
             unsigned char* const end = to + length;
+            if (linesUp) {
+                std::memcpy(to, &first, kSize);
+                to += kSize - static_cast<std::ptrdiff_t>(reinterpret_cast<std::uintptr_t>(to) % kSize);
+            }
             for (; end - to >= 3 * kSize; to += 3 * kSize) {
                 std::memcpy(to, &first, kSize);
                 std::memcpy(to + kSize, &second, kSize);

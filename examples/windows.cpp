@@ -1,5 +1,5 @@
-// Overlapping windows to play with: a click raises a window, dragging moves it, the wheel lowers and raises it,
-// a right click hides it. A click on the ground shows the hidden ones again, a right click there ends.
+// Overlapping windows to play with: a click raises a window, dragging moves it, the wheel lowers and raises
+// it, a right click hides it. A click on the ground shows the hidden ones again, a right click there ends.
 //
 // Each window paints a pattern of its own, and tally marks that tell how often it was asked to paint.
 #include <tessella.h>

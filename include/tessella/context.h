@@ -83,6 +83,18 @@ public:
 /// What contexts over images offer beyond `GrContext`.
 class GR_API GrContextI : public GrContext {
 public:
+    /// Fills the whole image from a stream of pixels: what `GrImage::Load` does, with the flags that the
+    /// image had when the context was made. `data` and `step` are as there.
+    virtual void LoadPixels(std::uint8_t const* data, unsigned step) = 0;
+    /// Fills the image from a stream of pixels as `LoadPixels` does, diffusing the errors of the conversion
+    /// whatever the flags say. `alpha` is null or holds one value for each pixel of the image: pixels with a
+    /// value below 255 are left alone. The fourth byte of a pixel of the stream is not looked at. Does nothing
+    /// in formats of 24 and 32 bits.
+    virtual void LoadPixelsDithered(std::uint8_t const* data, std::uint8_t const* alpha, unsigned step) = 0;
+    /// Writes the whole image as a stream of pixels: what `GrImage::Unload` does. `data` and `step` are as
+    /// there.
+    virtual void UnloadPixels(std::uint8_t* data, unsigned step) = 0;
+
     /// Puts both the base origin and the origin at surface point `x`, `y`.
     virtual void SetBaseOrigin(int x, int y) = 0;
     /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it. It must

@@ -224,6 +224,9 @@ struct Rows : GrGenericContext<GrGenericSurface<GrImageContextBase<3>, GrSurface
     using GrGenericSurface::CopyRowsIn;
     using GrGenericSurface::CopyRowsOut;
     using GrGenericSurface::PatternColumn;
+    void LoadPixels(std::uint8_t const*, unsigned) override {}
+    void LoadPixelsDithered(std::uint8_t const*, std::uint8_t const*, unsigned) override {}
+    void UnloadPixels(std::uint8_t*, unsigned) override {}
 };
 
 TEST(Rows, CopyBetweenSurfaceAndImageOfTheSameFormat)

@@ -119,6 +119,11 @@ TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
              Slot(&GrContext::GetOrigin), Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor),
              Slot(&GrContext::SetPattern), Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode),
              Slot(&GrContext::GetPixel), Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion),
+             Slot(&GrContext::FillRegionAlpha), Slot(&GrContext::DrawBitmap),
+             Slot(&GrContext::DrawBitmapTransparent), Slot(&GrContext::DrawImageMasked),
+             Slot(&GrContext::DrawImage), Slot(&GrContext::DrawImageAlpha), Slot(&GrContext::ReadImage),
+             Slot(&GrContext::DrawImageMaskedDirect), Slot(&GrContext::DrawImageDirect),
+             Slot(&GrContext::DrawImageAlphaDirect), Slot(&GrContext::ReadImageDirect),
              Slot(&GrContext::CopyFromContext), Slot(&GrContextI::LoadPixels),
              Slot(&GrContextI::LoadPixelsDithered), Slot(&GrContextI::UnloadPixels),
              Slot(&GrContextI::SetBaseOrigin), Slot(&GrContextI::SetLimitRegion)})

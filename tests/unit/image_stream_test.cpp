@@ -1,6 +1,8 @@
+#include <support/canvas.h>
 #include <tessella/bitmap.h>
 #include <tessella/image.h>
 #include <tessella/pixel/colors.h>
+#include <tessella/pixel/surface.h>
 
 #include <gtest/gtest.h>
 
@@ -10,25 +12,15 @@
 
 namespace {
 
-struct Format {
-    int bits, bytes;
-    std::uint32_t flags;
-    std::uint32_t (*toPixel)(GrColor);
-    GrColor (*fromPixel)(std::uint32_t);
-    bool dithers;
+struct Format : Canvas::Format {
+    std::uint32_t flags = 0;
 };
 
-template <typename Colors>
-Format FormatOf(int bits, int bytes, std::uint32_t flags = 0)
-{
-    return {bits, bytes, flags, [](GrColor c) -> std::uint32_t { return Colors::ToPixel(c); },
-        [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); },
-        Colors::kDithers};
-}
-
-Format const kFormats[] = {FormatOf<GrColors4>(4, 1), FormatOf<GrColors8>(8, 1), FormatOf<GrColors15>(15, 2),
-    FormatOf<GrColors16>(16, 2), FormatOf<GrColors24>(24, 3), FormatOf<GrColors24>(32, 4),
-    FormatOf<GrColorsRGBA>(32, 4, GrImageTrueColor)};
+Format const kFormats[] = {{Canvas::FormatOf<GrSurface8, GrColors4>()},
+    {Canvas::FormatOf<GrSurface8, GrColors8>()}, {Canvas::FormatOf<GrSurface16, GrColors15>()},
+    {Canvas::FormatOf<GrSurface16, GrColors16>()}, {Canvas::FormatOf<GrSurface24, GrColors24>()},
+    {Canvas::FormatOf<GrSurface32, GrColors24>(32)},
+    {Canvas::FormatOf<GrSurface32, GrColorsRGBA>(), GrImageTrueColor}};
 
 /// Loads random streams and judges every byte: a pixel at a time, the errors of the conversion as a table of
 /// the columns' and a triple of the row's.

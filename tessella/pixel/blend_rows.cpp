@@ -1,8 +1,66 @@
 #include <tessella/pixel/blend_rows.h>
 
+#include <tessella/pixel/wide_source.h>
+
+namespace {
+
+template <typename Format, bool kHasColors, bool kHasAlphas>
+GR_INLINE void BlendWide(GrBlend const& blend)
+{
+    WideSource<Format, kHasColors, kHasAlphas> source(blend);
+    WideWords const fore = Splat(blend.fore), back = Splat(blend.back);
+    unsigned char* row = blend.target.address;
+    for (std::ptrdiff_t y = 0; y < blend.target.height; ++y, row += blend.target.stride)
+        for (int x = 0; x < blend.target.width; x += kWide) {
+            unsigned char* const to = row + std::ptrdiff_t{x} * Format::Width::kBytes;
+            int const count = blend.target.width - x;
+            source.Load(y, x, count);
+            if (source.run == AlphaRun::Clear) {
+                if (!blend.overDestination) Format::Store(to, count, back);
+                continue;
+            }
+            WideWords opaque = fore;
+            if constexpr (kHasColors) opaque = Format::Join(source.color);
+            if (source.run == AlphaRun::Opaque) {
+                Format::Store(to, count, opaque);
+                continue;
+            }
+            // Over the back colour everything is as if the target held that everywhere.
+            WideWords below = back;
+            if (blend.overDestination) below = Format::Load(to, count);
+            WideWords pixels = Format::Join(source.MixedOver(below));
+            if constexpr (kHasAlphas) {
+                pixels = source.alpha == 255 ? opaque : pixels;
+                pixels = source.alpha == 0 ? below : pixels;
+            }
+            Format::Store(to, count, pixels);
+        }
+}
+
+template <typename Format>
+GR_INLINE void BlendFormat(GrBlend const& blend)
+{
+    if (blend.colors)
+        blend.alphas ? BlendWide<Format, true, true>(blend) : BlendWide<Format, true, false>(blend);
+    else
+        blend.alphas ? BlendWide<Format, false, true>(blend) : BlendWide<Format, false, false>(blend);
+}
+
+GR_CLONES void Blend(Wide8, GrBlend const& blend) { BlendFormat<Wide8>(blend); }
+GR_CLONES void Blend(Wide15, GrBlend const& blend) { BlendFormat<Wide15>(blend); }
+GR_CLONES void Blend(Wide16, GrBlend const& blend) { BlendFormat<Wide16>(blend); }
+GR_CLONES void Blend(Wide24<GrSurface24>, GrBlend const& blend) { BlendFormat<Wide24<GrSurface24>>(blend); }
+GR_CLONES void Blend(Wide24<GrSurface32>, GrBlend const& blend) { BlendFormat<Wide24<GrSurface32>>(blend); }
+GR_CLONES void Blend(WideRGB, GrBlend const& blend) { BlendFormat<WideRGB>(blend); }
+
+}
+
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void BlendRows(GrBlend const& blend)
 {
+    if constexpr (requires { WideOf(Surface{}, Colors{}); }) {
+        if (!blend.errors) return Blend(decltype(WideOf(Surface{}, Colors{})){}, blend);
+    }
     BlendPixels<Surface, Colors>(blend);
 }
 

@@ -1,0 +1,77 @@
+#pragma once
+
+#include <tessella/pixel/blend.h>
+#include <tessella/pixel/clones.h>
+
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+
+// Sixteen pixels at a time: how each format loads and stores them, and how their colours are mixed. Written in
+// the compilers' own vectors, which become what registers there are.
+
+// Everything here is inlined, so that no vector is ever passed in a way that depends on the processor.
+#pragma GCC diagnostic ignored "-Wpsabi"
+
+constexpr int kWide = 16;
+using WideWords = std::uint32_t __attribute__((vector_size(64)));  ///< one word a pixel
+using WideShorts = std::uint16_t __attribute__((vector_size(32)));
+using WideBytes = std::uint8_t __attribute__((vector_size(16)));
+using WideHalves = std::uint16_t __attribute__((vector_size(64)));  ///< two a pixel
+
+/// Colours taken apart, so that there is room for products: red in bits 0 to 7 and blue in 16 to 23 of one
+/// word, green in bits 0 to 7 of the other.
+struct WideChannels {
+    WideWords redBlue, green;
+};
+
+GR_INLINE WideWords Splat(std::uint32_t word) { return WideWords{} + word; }
+
+GR_INLINE WideChannels SplitColors(WideWords const& colors)
+{
+    return {colors & 0x00FF00FF, colors >> 8 & 0xFF};
+}
+
+/// The word's halves exchanged.
+GR_INLINE WideWords Turned(WideWords const& words) { return words << 16 | words >> 16; }
+
+/// Both halves of each word times those of `factors`, / 256.
+GR_INLINE WideWords Scaled(WideWords const& words, WideWords const& factors)
+{
+    return (WideWords)((WideHalves)words * (WideHalves)factors >> 8);
+}
+
+GR_INLINE WideChannels Scaled(WideChannels const& channels, WideWords const& factors)
+{
+    WideWords const both = factors | factors << 16;
+    return {Scaled(channels.redBlue, both), Scaled(channels.green, both)};
+}
+
+/// `Mixed` of sixteen colours: ninth bits spill into the next channel here, too.
+GR_INLINE WideWords Mixed(
+    WideChannels const& source, WideChannels const& destination, WideWords const& alphas)
+{
+    WideChannels const rest = Scaled(destination, 255 - alphas);
+    return (source.redBlue + rest.redBlue) | (source.green + rest.green) << 8 | 0xFF000000;
+}
+
+/// Reads and writes `count` pixels of `Bytes` each as sixteen; those beyond are 0, and not written.
+template <int Bytes, typename Vector>
+GR_INLINE Vector LoadSome(unsigned char const* from, int count)
+{
+    Vector pixels{};
+    if (count >= kWide)
+        std::memcpy(&pixels, from, Bytes * kWide);
+    else
+        std::memcpy(&pixels, from, static_cast<std::size_t>(Bytes * count));
+    return pixels;
+}
+
+template <int Bytes, typename Vector>
+GR_INLINE void StoreSome(unsigned char* to, int count, Vector const& pixels)
+{
+    if (count >= kWide)
+        std::memcpy(to, &pixels, Bytes * kWide);
+    else
+        std::memcpy(to, &pixels, static_cast<std::size_t>(Bytes * count));
+}

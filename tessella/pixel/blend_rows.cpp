@@ -1,5 +1,6 @@
 #include <tessella/pixel/blend_rows.h>
 
+#include <tessella/pixel/diffuse_rows.h>
 #include <tessella/pixel/wide_source.h>
 
 namespace {
@@ -59,7 +60,9 @@ template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void BlendRows(GrBlend const& blend)
 {
     if constexpr (requires { WideOf(Surface{}, Colors{}); }) {
-        if (!blend.errors) return Blend(decltype(WideOf(Surface{}, Colors{})){}, blend);
+        decltype(WideOf(Surface{}, Colors{})) const format;
+        if (!blend.errors || (!blend.alphas && blend.alpha == 0)) return Blend(format, blend);
+        if constexpr (Colors::kDithers) return DiffuseRows(format, blend);
     }
     BlendPixels<Surface, Colors>(blend);
 }

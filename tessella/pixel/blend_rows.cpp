@@ -21,7 +21,7 @@ GR_INLINE void BlendWide(GrBlend const& blend)
                 continue;
             }
             WideWords opaque = fore;
-            if constexpr (kHasColors) opaque = Format::Join(source.color);
+            if constexpr (kHasColors) opaque = Format::ToPixels(source.color);
             if (source.run == AlphaRun::Opaque) {
                 Format::Store(to, count, opaque);
                 continue;
@@ -29,7 +29,7 @@ GR_INLINE void BlendWide(GrBlend const& blend)
             // Over the back colour everything is as if the target held that everywhere.
             WideWords below = back;
             if (blend.overDestination) below = Format::Load(to, count);
-            WideWords pixels = Format::Join(source.MixedOver(below));
+            WideWords pixels = Format::ToPixels(source.MixedOver(below));
             if constexpr (kHasAlphas) {
                 pixels = source.alpha == 255 ? opaque : pixels;
                 pixels = source.alpha == 0 ? below : pixels;

@@ -1,3 +1,4 @@
+#include <algorithm>
 #include <memory>
 
 template <typename S, GrColorsPolicy Colors>
@@ -34,14 +35,51 @@ void GrGenericContext<S, Colors>::ReadImage(GrRect const& src, GrImage& image, i
 }
 
 template <typename S, GrColorsPolicy Colors>
+GrPixelExtent GrGenericContext<S, Colors>::ExtentOfClip() const
+{
+    GrRect outer;
+    this->clip.GetOuterRect(outer);
+    if (!this->HasPixelsIn(outer)) return {nullptr, nullptr};
+    return {this->RowAddress(outer.y1), this->RowAddress(outer.y2)};
+}
+
+template <typename S, GrColorsPolicy Colors>
+void GrGenericContext<S, Colors>::ReadClipped(int x, int y, int count, GrColor* colors) const
+{
+    std::fill_n(colors, count, GrColor{0});
+    int const left = Moved(x, this->originX), right = Moved(left, count), row = Moved(y, this->originY);
+    GrRegion::Band const* const band = this->clip.FindBand(row);
+    if (!band || !this->HasPixels()) return;
+    for (auto const& range : RangesOf(*band)) {
+        int const from = std::max(range.r1, left), to = std::min(range.r2, right);
+        if (from >= to) continue;
+        typename S::Guard const guard(GrRect{from, row, to, row + 1});
+        ReadColors<typename S::Width, Colors>(
+            this->PixelAddress(this->RowAddress(row), from), to - from, colors + (from - left));
+    }
+}
+
+template <typename S, GrColorsPolicy Colors>
 void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy)
 {
+    GrColorSource const colorSource(*source);
+    bool const readAhead = colorSource.MayReadAhead(ExtentOfClip());
     this->WalkClip(
         this->OnSurface(dst), sx, sy, [&](GrRange xRange, GrRange yRange, int sourceX, int sourceY) {
             unsigned char* row = this->RowAddress(yRange.r1);
-            for (int y = 0; y < yRange.r2 - yRange.r1; ++y, row += this->Stride())
-                for (int x = 0; x < xRange.r2 - xRange.r1; ++x)
-                    this->WritePixel(row, xRange.r1 + x,
-                        Colors::ToPixel(source->GetPixel(Moved(sourceX, x), Moved(sourceY, y))));
+            for (int y = 0; y < yRange.r2 - yRange.r1; ++y, row += this->Stride()) {
+                GrColor colors[kColorsAtOnce];
+                int atOnce = 1;
+                for (int x = xRange.r1; x < xRange.r2; x += atOnce) {
+                    int const column = Moved(sourceX, x - xRange.r1);
+                    if (readAhead) {
+                        atOnce = std::min(xRange.r2 - x, kColorsAtOnce);
+                        colorSource.Read(column, Moved(sourceY, y), atOnce, colors);
+                    } else {
+                        colors[0] = source->GetPixel(column, Moved(sourceY, y));
+                    }
+                    WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), atOnce, colors);
+                }
+            }
         });
 }

@@ -49,7 +49,7 @@ GR_INLINE void StoreColors(
         unsigned char* const address = row + std::ptrdiff_t{x} * Format::Width::kBytes;
         int const count = to - x;
         auto const reached = LoadSome<4, WideWords>(reinterpret_cast<unsigned char const*>(colors), count);
-        WideWords pixels = Format::Join(reached);
+        WideWords pixels = Format::ToPixels(reached);
         if constexpr (kHasAlphas) {
             WideWords kept = Splat(blend.back);
             if (blend.overDestination) kept = Format::Load(address, count);

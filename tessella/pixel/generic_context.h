@@ -5,7 +5,9 @@
 #include <tessella/coordinates.h>
 #include <tessella/pixel/blend_rows.h>
 #include <tessella/pixel/clip_walk.h>
+#include <tessella/pixel/color_source.h>
 #include <tessella/pixel/colors.h>
+#include <tessella/pixel/convert_rows.h>
 #include <tessella/pixel/generic_surface.h>
 #include <tessella/region_cut.h>
 
@@ -95,7 +97,13 @@ public:
         GrRect const& dst, GrImage const* image, int sx, int sy, GrBlendParams const& params) override;
     void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy) override;
 
+    /// For others to copy from: where the pixels lie that the clip lets through, and what `GetPixel` yields
+    /// for `count` pixels from `x`, `y` on.
+    GrPixelExtent ExtentOfClip() const;
+    void ReadClipped(int x, int y, int count, GrColor* colors) const;
+
 private:
+    static constexpr int kColorsAtOnce = 256;
     static constexpr char kSource[] = GR_SOURCE("tessella/context");
 
     /// All other images are converted pixel by pixel.

@@ -32,6 +32,11 @@ GR_INLINE WideChannels SplitColors(WideWords const& colors)
     return {colors & 0x00FF00FF, colors >> 8 & 0xFF};
 }
 
+GR_INLINE WideWords JoinChannels(WideChannels const& channels)
+{
+    return channels.redBlue | channels.green << 8;
+}
+
 /// The word's halves exchanged.
 GR_INLINE WideWords Turned(WideWords const& words) { return words << 16 | words >> 16; }
 

@@ -2,8 +2,8 @@
 
 #include <tessella/pixel/wide.h>
 
-// The formats sixteen pixels at a time. `Load` and `Store` move up to sixteen, one in each word; `Split` is
-// `FromPixel`, without the alpha; `Join` is `ToPixel`.
+// The formats sixteen pixels at a time. `Load` and `Store` move up to sixteen, one in each word; `FromPixels`
+// and `ToPixels` are the conversions of the colours; `Split` is the colours taken apart, without the alpha.
 
 template <typename Packed>
 struct WidePacked {
@@ -28,14 +28,15 @@ struct Wide8 : WidePacked<WideBytes> {
     {
         return (WideWords)(((WideHalves)channels + 25) * 161 >> 13);
     }
-    GR_INLINE static WideChannels Split(WideWords const& pixels)
+    GR_INLINE static WideWords FromPixels(WideWords const& pixels)
     {
         WideWords colors;
         for (int i = 0; i < kWide; ++i)
             colors[i] = GrColors8::FromPixel(static_cast<std::uint8_t>(pixels[i]));
-        return SplitColors(colors);
+        return colors;
     }
-    GR_INLINE static WideWords Join(WideWords const& colors)
+    GR_INLINE static WideChannels Split(WideWords const& pixels) { return SplitColors(FromPixels(pixels)); }
+    GR_INLINE static WideWords ToPixels(WideWords const& colors)
     {
         WideChannels const channels = SplitColors(colors);
         WideWords const levels = Levels(channels.redBlue);
@@ -51,7 +52,8 @@ struct Wide15 : WidePacked<WideShorts> {
     {
         return {(pixels >> 7 & 0xF8) | (pixels & 0x1F) << 19, pixels >> 2 & 0xF8};
     }
-    GR_INLINE static WideWords Join(WideWords const& colors)
+    GR_INLINE static WideWords FromPixels(WideWords const& pixels) { return JoinChannels(Split(pixels)); }
+    GR_INLINE static WideWords ToPixels(WideWords const& colors)
     {
         return (colors << 7 & 0x7C00) | (colors >> 6 & 0x03E0) | (colors >> 19 & 0x001F);
     }
@@ -65,7 +67,8 @@ struct Wide16 : WidePacked<WideShorts> {
     {
         return {(pixels >> 8 & 0xF8) | (pixels & 0x1F) << 19, pixels >> 3 & 0xFC};
     }
-    GR_INLINE static WideWords Join(WideWords const& colors)
+    GR_INLINE static WideWords FromPixels(WideWords const& pixels) { return JoinChannels(Split(pixels)); }
+    GR_INLINE static WideWords ToPixels(WideWords const& colors)
     {
         return (colors << 8 & 0xF800) | (colors >> 5 & 0x07E0) | (colors >> 19 & 0x001F);
     }
@@ -95,7 +98,8 @@ struct Wide24 {
     {
         return {Turned(pixels & 0x00FF00FF), pixels >> 8 & 0xFF};
     }
-    GR_INLINE static WideWords Join(WideWords const& colors)
+    GR_INLINE static WideWords FromPixels(WideWords const& pixels) { return JoinChannels(Split(pixels)); }
+    GR_INLINE static WideWords ToPixels(WideWords const& colors)
     {
         return Turned(colors & 0x00FF00FF) | (colors & 0xFF00);
     }
@@ -113,8 +117,9 @@ struct WideRGB {
     {
         StoreSome<4>(to, count, pixels);
     }
+    GR_INLINE static WideWords FromPixels(WideWords const& pixels) { return pixels; }
     GR_INLINE static WideChannels Split(WideWords const& pixels) { return SplitColors(pixels); }
-    GR_INLINE static WideWords Join(WideWords const& colors) { return colors; }
+    GR_INLINE static WideWords ToPixels(WideWords const& colors) { return colors; }
 };
 
 // The format of a surface with its colours. There is none for 16 colours, which are looked up one by one, and

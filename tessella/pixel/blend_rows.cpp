@@ -6,9 +6,10 @@
 namespace {
 
 template <typename Format, bool kHasColors, bool kHasAlphas>
-GR_INLINE void BlendWide(GrBlend const& blend)
+GR_INLINE void BlendWide(GrBlend const& job)
 {
-    WideSource<Format, kHasColors, kHasAlphas> source(blend);
+    WideSource<Format, kHasColors, kHasAlphas> source(job);
+    GrBlend const& blend = source.blend;
     WideWords const fore = Splat(blend.fore), back = Splat(blend.back);
     unsigned char* row = blend.target.address;
     for (std::ptrdiff_t y = 0; y < blend.target.height; ++y, row += blend.target.stride)

@@ -25,7 +25,30 @@ struct WideChannels {
     WideWords redBlue, green;
 };
 
-GR_INLINE WideWords Splat(std::uint32_t word) { return WideWords{} + word; }
+GR_INLINE WideWords Splat(std::uint32_t word)
+{
+    std::uint32_t words[kWide];
+    for (std::uint32_t& one : words)
+        one = word;
+    WideWords splat;
+    std::memcpy(&splat, words, sizeof splat);
+    return splat;
+}
+
+// By way of shorts: compilers take words apart one by one otherwise.
+GR_INLINE WideWords Widened(WideShorts const& shorts) { return __builtin_convertvector(shorts, WideWords); }
+GR_INLINE WideWords Widened(WideBytes const& bytes)
+{
+    return Widened(__builtin_convertvector(bytes, WideShorts));
+}
+GR_INLINE void Narrow(WideWords const& words, WideShorts& shorts)
+{
+    shorts = __builtin_convertvector(words, WideShorts);
+}
+GR_INLINE void Narrow(WideWords const& words, WideBytes& bytes)
+{
+    bytes = __builtin_convertvector(__builtin_convertvector(words, WideShorts), WideBytes);
+}
 
 GR_INLINE WideChannels SplitColors(WideWords const& colors)
 {
@@ -64,19 +87,23 @@ GR_INLINE WideWords Mixed(
 template <int Bytes, typename Vector>
 GR_INLINE Vector LoadSome(unsigned char const* from, int count)
 {
-    Vector pixels{};
-    if (count >= kWide)
-        std::memcpy(&pixels, from, Bytes * kWide);
-    else
-        std::memcpy(&pixels, from, static_cast<std::size_t>(Bytes * count));
+    if (count < kWide) [[unlikely]] {
+        Vector few{};
+        std::memcpy(&few, from, static_cast<std::size_t>(Bytes * count));
+        return few;
+    }
+    Vector pixels;
+    std::memcpy(&pixels, from, Bytes * kWide);
     return pixels;
 }
 
 template <int Bytes, typename Vector>
 GR_INLINE void StoreSome(unsigned char* to, int count, Vector const& pixels)
 {
-    if (count >= kWide)
+    if (count < kWide) [[unlikely]] {
+        Vector const few = pixels;
+        std::memcpy(to, &few, static_cast<std::size_t>(Bytes * count));
+    } else {
         std::memcpy(to, &pixels, Bytes * kWide);
-    else
-        std::memcpy(to, &pixels, static_cast<std::size_t>(Bytes * count));
+    }
 }

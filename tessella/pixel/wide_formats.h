@@ -11,11 +11,13 @@ struct WidePacked {
 
     GR_INLINE static WideWords Load(unsigned char const* from, int count)
     {
-        return __builtin_convertvector((LoadSome<kBytes, Packed>(from, count)), WideWords);
+        return Widened(LoadSome<kBytes, Packed>(from, count));
     }
     GR_INLINE static void Store(unsigned char* to, int count, WideWords const& pixels)
     {
-        StoreSome<kBytes>(to, count, __builtin_convertvector(pixels, Packed));
+        Packed packed;
+        Narrow(pixels, packed);
+        StoreSome<kBytes>(to, count, packed);
     }
 };
 

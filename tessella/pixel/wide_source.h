@@ -26,13 +26,19 @@ struct WideSource {
         std::ptrdiff_t const index = y * blend.sourceWidth + x;
         if constexpr (kHasColors) color = LoadSome<4, WideWords>(blend.colors + index * 4, count);
         if constexpr (kHasAlphas) {
-            auto const bytes = LoadSome<1, WideBytes>(blend.alphas + index, count);
+            unsigned char few[kWide] = {};
+            unsigned char const* alphas = blend.alphas + index;
+            if (count < kWide) [[unlikely]]
+                alphas =
+                    static_cast<unsigned char*>(std::memcpy(few, alphas, static_cast<std::size_t>(count)));
             std::uint64_t halves[2];
-            std::memcpy(halves, &bytes, sizeof halves);
+            std::memcpy(halves, alphas, sizeof halves);
             run = (halves[0] | halves[1]) == 0                 ? AlphaRun::Clear
                 : (halves[0] & halves[1]) == ~std::uint64_t{0} ? AlphaRun::Opaque
                                                                : AlphaRun::Mixed;
-            alpha = __builtin_convertvector(bytes, WideWords);
+            WideBytes bytes;
+            std::memcpy(&bytes, alphas, sizeof bytes);
+            alpha = Widened(bytes);
         }
     }
 
@@ -44,7 +50,7 @@ struct WideSource {
         return Mixed(source, Format::Split(pixels), alpha);
     }
 
-    GrBlend const& blend;
+    GrBlend const blend;  // a copy: no store can change it
     AlphaRun run;
     WideWords alpha;
     WideWords color;

@@ -5,17 +5,21 @@
 
 namespace {
 
+constexpr WideWords kLanes = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
+
 template <typename Format, bool kHasColors, bool kHasAlphas>
 GR_INLINE void BlendWide(GrBlend const& job)
 {
     WideSource<Format, kHasColors, kHasAlphas> source(job);
     GrBlend const& blend = source.blend;
     WideWords const fore = Splat(blend.fore), back = Splat(blend.back);
+    int const width = blend.target.width;
     unsigned char* row = blend.target.address;
     for (std::ptrdiff_t y = 0; y < blend.target.height; ++y, row += blend.target.stride)
-        for (int x = 0; x < blend.target.width; x += kWide) {
+        for (int next = 0; next < width; next += kWide) {
+            int const x = WideStart(next, 0, width);
+            int const count = width - x;
             unsigned char* const to = row + std::ptrdiff_t{x} * Format::Width::kBytes;
-            int const count = blend.target.width - x;
             source.Load(y, x, count);
             if (source.run == AlphaRun::Clear) {
                 if (!blend.overDestination) Format::Store(to, count, back);
@@ -35,6 +39,9 @@ GR_INLINE void BlendWide(GrBlend const& job)
                 pixels = source.alpha == 255 ? opaque : pixels;
                 pixels = source.alpha == 0 ? below : pixels;
             }
+            // What was blended before must not be blended again; all else comes to the same.
+            if (x < next && blend.overDestination)
+                pixels = kLanes < Splat(static_cast<unsigned>(next - x)) ? below : pixels;
             Format::Store(to, count, pixels);
         }
 }

@@ -7,20 +7,20 @@ namespace {
 template <typename Format>
 GR_INLINE void ReadWide(unsigned char const* pixels, int count, GrColor* colors)
 {
-    auto* const to = reinterpret_cast<unsigned char*>(colors);
-    for (int x = 0; x < count; x += kWide) {
-        std::ptrdiff_t const from = std::ptrdiff_t{x} * Format::Width::kBytes;
-        StoreSome<4>(to + std::ptrdiff_t{x} * 4, count - x,
-            Format::FromPixels(Format::Load(pixels + from, count - x)));
+    for (int next = 0; next < count; next += kWide) {
+        int const x = WideStart(next, 0, count);
+        auto const some = Format::Load(pixels + std::ptrdiff_t{x} * Format::Width::kBytes, count - x);
+        StoreSome<4>(reinterpret_cast<unsigned char*>(colors + x), count - x, Format::FromPixels(some));
     }
 }
 
 template <typename Format>
 GR_INLINE void WriteWide(unsigned char* pixels, int count, GrColor const* colors)
 {
-    auto const* const from = reinterpret_cast<unsigned char const*>(colors);
-    for (int x = 0; x < count; x += kWide) {
-        auto const some = LoadSome<4, WideWords>(from + std::ptrdiff_t{x} * 4, count - x);
+    for (int next = 0; next < count; next += kWide) {
+        int const x = WideStart(next, 0, count);
+        auto const* const from = reinterpret_cast<unsigned char const*>(colors + x);
+        WideWords const some = LoadSome<4, WideWords>(from, count - x);
         Format::Store(pixels + std::ptrdiff_t{x} * Format::Width::kBytes, count - x, Format::ToPixels(some));
     }
 }

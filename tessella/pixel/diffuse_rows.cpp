@@ -17,8 +17,9 @@ GR_INLINE void FillColors(WideSource<Format, kHasColors, kHasAlphas>& source, st
 {
     GrBlend const& blend = source.blend;
     unsigned char const* const row = blend.target.address + y * blend.target.stride;
-    for (int x = from; x < to; x += kWide, colors += kWide) {
-        int const count = blend.target.width - x;
+    for (int next = from; next < to; next += kWide) {
+        int const x = WideStart(next, from, to);
+        int const count = to - x;
         source.Load(y, x, count);
         WideWords wanted = source.color | 0xFF000000;
         if (source.run == AlphaRun::Clear) wanted = WideWords{};
@@ -34,7 +35,7 @@ GR_INLINE void FillColors(WideSource<Format, kHasColors, kHasAlphas>& source, st
                 wanted = mixed;
             }
         }
-        std::memcpy(colors, &wanted, sizeof wanted);
+        StoreSome<4>(reinterpret_cast<unsigned char*>(colors + (x - from)), count, wanted);
     }
 }
 
@@ -45,10 +46,12 @@ GR_INLINE void StoreColors(
 {
     using Signs = std::int32_t __attribute__((vector_size(64)));
     unsigned char* const row = blend.target.address + y * blend.target.stride;
-    for (int x = from; x < to; x += kWide, colors += kWide) {
-        unsigned char* const address = row + std::ptrdiff_t{x} * Format::Width::kBytes;
+    for (int next = from; next < to; next += kWide) {
+        int const x = WideStart(next, from, to);
         int const count = to - x;
-        auto const reached = LoadSome<4, WideWords>(reinterpret_cast<unsigned char const*>(colors), count);
+        unsigned char* const address = row + std::ptrdiff_t{x} * Format::Width::kBytes;
+        auto const* const words = reinterpret_cast<unsigned char const*>(colors + (x - from));
+        auto const reached = LoadSome<4, WideWords>(words, count);
         WideWords pixels = Format::ToPixels(reached);
         if constexpr (kHasAlphas) {
             WideWords kept = Splat(blend.back);

@@ -83,6 +83,13 @@ GR_INLINE WideWords Mixed(
     return (source.redBlue + rest.redBlue) | (source.green + rest.green) << 8 | 0xFF000000;
 }
 
+/// Where the sixteen columns begin that contain `next`, out of `from` to `to`. The last ones go back over some
+/// that are done already, unless there are fewer than sixteen in all.
+constexpr int WideStart(int next, int from, int to)
+{
+    return to - next < kWide && to - from >= kWide ? to - kWide : next;
+}
+
 /// Reads and writes `count` pixels of `Bytes` each as sixteen; those beyond are 0, and not written.
 template <int Bytes, typename Vector>
 GR_INLINE Vector LoadSome(unsigned char const* from, int count)

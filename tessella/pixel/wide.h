@@ -6,6 +6,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <type_traits>
 
 // Sixteen pixels at a time: how each format loads and stores them, and how their colours are mixed. Written in
 // the compilers' own vectors, which become what registers there are.
@@ -35,19 +36,32 @@ GR_INLINE WideWords Splat(std::uint32_t word)
     return splat;
 }
 
-// By way of shorts: compilers take words apart one by one otherwise.
-GR_INLINE WideWords Widened(WideShorts const& shorts) { return __builtin_convertvector(shorts, WideWords); }
-GR_INLINE WideWords Widened(WideBytes const& bytes)
+// Word by word and through memory, as it seems: compilers find the one instruction for it, where there is one,
+// better than for their own vectors.
+template <typename Packed>
+GR_INLINE WideWords Widened(Packed const& packed)
 {
-    return Widened(__builtin_convertvector(bytes, WideShorts));
+    std::remove_cvref_t<decltype(packed[0])> parts[kWide];
+    std::memcpy(parts, &packed, sizeof parts);
+    std::uint32_t words[kWide];
+    for (int i = 0; i < kWide; ++i)
+        words[i] = parts[i];
+    WideWords widened;
+    std::memcpy(&widened, words, sizeof widened);
+    return widened;
 }
-GR_INLINE void Narrow(WideWords const& words, WideShorts& shorts)
+
+template <typename Packed>
+GR_INLINE Packed Narrowed(WideWords const& wide)
 {
-    shorts = __builtin_convertvector(words, WideShorts);
-}
-GR_INLINE void Narrow(WideWords const& words, WideBytes& bytes)
-{
-    bytes = __builtin_convertvector(__builtin_convertvector(words, WideShorts), WideBytes);
+    std::uint32_t words[kWide];
+    std::memcpy(words, &wide, sizeof words);
+    Packed packed;
+    std::remove_cvref_t<decltype(packed[0])> parts[kWide];
+    for (int i = 0; i < kWide; ++i)
+        parts[i] = static_cast<std::remove_cvref_t<decltype(packed[0])>>(words[i]);
+    std::memcpy(&packed, parts, sizeof packed);
+    return packed;
 }
 
 GR_INLINE WideChannels SplitColors(WideWords const& colors)

@@ -15,9 +15,7 @@ struct WidePacked {
     }
     GR_INLINE static void Store(unsigned char* to, int count, WideWords const& pixels)
     {
-        Packed packed;
-        Narrow(pixels, packed);
-        StoreSome<kBytes>(to, count, packed);
+        StoreSome<kBytes>(to, count, Narrowed<Packed>(pixels));
     }
 };
 

@@ -11,7 +11,7 @@ import sys
 
 OURS = "tessella"
 CLOCK = "/process_time"  # how Google Benchmark marks the clock that main.cpp asks for
-GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills"]
+GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills", "blits"]
 
 # These merge with lists of bands that the library reports as damaged, each time with the call stack. They run
 # with the reports off, which leaves the work itself, and on; all other rows report nothing and run with
@@ -37,6 +37,19 @@ GOALS = [(re.compile(row), least, aim) for row, least, aim in [
     (r"solid fill 1024x768, (16|24|32) bits", 0.9, 1.0),
     (r"solid fill 300x200, ", 0.8, 0.9),
     (r"FillRegion 16x16, .*clip of 1 range,", 0.8, 1.1),
+    (r"copy 1024x768, 32 bits", 0.85, 0.95),
+    (r"copy 16x16, 32 bits", 0.9, 1.1),
+    (r"convert ", 1.0, 2),
+    (r"blend 300x200, random alpha, 32 bits", 0.8, 2),
+    (r"blend 300x200, random alpha, 16 bits", 1.2, 2.6),
+    (r"blend 300x200, alpha like an icon's", 1.0, 1.6),
+    (r"blend 300x200, uniform alpha, 32 bits", 1.0, 1.7),
+    (r"blend 300x200, uniform alpha, 16 bits", 2.0, 4),
+    (r"(shade|FillRegionAlpha) 300x200, 32 bits", 1.0, 1.5),
+    (r"(shade|FillRegionAlpha) 300x200, 16 bits", 1.0, 2),
+    (r"diffuse 300x200, opaque, 16 bits", 6, 10),
+    (r"diffuse 300x200, over, 16 bits", 5, 6),
+    (r"diffuse 300x200, opaque, 8 bits", 4, 6),
 ]]
 
 # One union into 10,000 rectangles may cost this much more than one into 1,000.

@@ -1,6 +1,7 @@
 #pragma once
 
 /// Everything that the library offers to applications.
+#include <tessella/bitmap.h>
 #include <tessella/color.h>
 #include <tessella/context.h>
 #include <tessella/event.h>

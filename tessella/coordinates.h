@@ -23,6 +23,14 @@ constexpr int SeenFrom(int coordinate, int origin)
     return static_cast<int>(std::clamp<std::int64_t>(difference, Limits::min(), Limits::max()));
 }
 
+/// Where in a source, whose coordinate `start` goes to `left`, that comes from which goes to `at`.
+constexpr int SourceOf(int start, int at, int left)
+{
+    using Limits = std::numeric_limits<int>;
+    std::int64_t const source = std::int64_t{start} + at - left;
+    return static_cast<int>(std::clamp<std::int64_t>(source, Limits::min(), Limits::max()));
+}
+
 constexpr GrRect Moved(GrRect const& rect, int dx, int dy)
 {
     return {Moved(rect.x1, dx), Moved(rect.y1, dy), Moved(rect.x2, dx), Moved(rect.y2, dy)};

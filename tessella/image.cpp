@@ -4,6 +4,8 @@
 #include <tessella/pixel/image_contexts.h>
 #include <tessella/screen.h>
 
+#include <memory>
+
 namespace {
 
 constexpr char kSource[] = GR_SOURCE("tessella/image");
@@ -13,6 +15,12 @@ constexpr std::uint32_t kChangeableFlags = GrImageNoDither | GrImageOverBack;
 std::uint32_t CompleteFlags(std::uint32_t flags)
 {
     return flags & GrImageHasAlpha ? flags | GrImageTrueColor : flags;
+}
+
+/// Contexts over images are of this one kind, whichever factory made them.
+std::unique_ptr<GrContextI> NewImageContext(GrImage const& image)
+{
+    return std::unique_ptr<GrContextI>(static_cast<GrContextI*>(image.GetContext()));
 }
 
 }
@@ -66,6 +74,17 @@ void GrImage::Detach()
 void GrImage::SetFlags(std::uint32_t newFlags)
 {
     flags = (flags & ~kChangeableFlags) | (newFlags & kChangeableFlags);
+}
+
+void GrImage::Load(unsigned char const* data, unsigned step)
+{
+    flags |= GrImagePremultiplied;  // before the context is made: it decides the context's class
+    if (auto const context = NewImageContext(*this)) context->LoadPixels(data, step);
+}
+
+void GrImage::Unload(unsigned char* data, unsigned step)
+{
+    if (auto const context = NewImageContext(*this)) context->UnloadPixels(data, step);
 }
 
 GrContext* GrImage::GetContext() const

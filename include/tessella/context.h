@@ -7,6 +7,18 @@
 
 #include <cstdint>
 
+class GrBitmap;
+class GrImage;
+
+/// How `GrContext::DrawImageAlpha` blends.
+struct GrBlendParams {
+    bool overDestination;  ///< over what the surface holds; else over the back colour, everywhere
+    bool dither;           ///< diffuse the error of converting, in formats of at most 16 bits
+    bool uniformAlpha;     ///< `alpha` holds for all pixels; else each has its own in the alpha plane
+    std::uint8_t alpha;    ///< 0 transparent to 255 opaque
+};
+static_assert(sizeof(GrBlendParams) == 4);
+
 /// The raster mode that paints in the fore and back colours; every other value inverts the pixels.
 enum : std::uint32_t { GrRasterModeCopy = 4 };
 
@@ -74,15 +86,79 @@ public:
     virtual void DrawPixel(int x, int y) = 0;
     /// Paints a region through pattern and raster mode.
     virtual void FillRegion(GrRegion const& region) = 0;
+    /// Blends the fore colour over the smallest rectangle around `region`, holes included, with the same
+    /// alpha everywhere, 0 transparent to 255 opaque. Formats of at most 16 bits diffuse errors.
+    virtual void FillRegionAlpha(GrRegion const& region, std::uint8_t alpha) = 0;
 
-    /// Does nothing, unless the context can copy from another: then it fills the rectangle `dst` from
-    /// `source`, whose point `sx`, `sy`, in its own context coordinates, goes to the top left corner.
+    /// Paints the set pixels of a bitmap in the fore colour and the clear ones in the back colour, with its
+    /// top left corner at `x`, `y`. Pattern and raster mode are not looked at.
+    virtual void DrawBitmap(int x, int y, GrBitmap const& bitmap) = 0;
+    /// Paints the set pixels of a bitmap through pattern and raster mode and leaves the clear ones alone.
+    virtual void DrawBitmapTransparent(int x, int y, GrBitmap const& bitmap) = 0;
+
+    /// Copies those pixels of an image to the rectangle `dst` that are set in `mask`, which belongs to the
+    /// image: pixel `sx`, `sy` of both goes to the top left corner. Does nothing if the image and the mask
+    /// are of different sizes. The image must be in the context's own format: nothing tests or converts it.
+    /// As with all operations on images, the pixels that are asked for must lie in the image: only the
+    /// surface clips.
+    virtual void DrawImageMasked(
+        GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) = 0;
+    /// Copies an image to the rectangle `dst`; its pixel `sx`, `sy` goes to the top left corner. An image
+    /// with an alpha plane is blended as its flags say. Other images are copied, fast if `bits` and `bytes`
+    /// are those of the context's format. All others are converted as `CopyFromContext` does, and pixels that
+    /// are not in the image become black then; without errors being diffused.
+    virtual void DrawImage(GrRect const& dst, GrImage const& image, int sx, int sy) = 0;
+    /// Blends a true-colour image into the rectangle `dst`, or the fore colour if `image` is null; its pixel
+    /// `sx`, `sy` goes to the top left corner. An image without pixels, but with an alpha plane, gives the
+    /// fore colour its shape. A pixel of an image is expected to be multiplied by its own alpha already, and
+    /// not by a uniform one. With `overDestination` alpha 0 leaves a pixel alone; otherwise it takes the back
+    /// colour. Products are shifted, not rounded, so that blends come out a little dark; sums are not
+    /// limited, but run over into the next channel. An image that is not of true colour is reported by a
+    /// failed assertion and not drawn; nor is anything if there should be an alpha plane, but is none.
+    virtual void DrawImageAlpha(
+        GrRect const& dst, GrImage const* image, int sx, int sy, GrBlendParams const& params) = 0;
+    /// Copies the rectangle `src` of the surface to an image, from its pixel `dx`, `dy` on. What lies outside
+    /// the clip is not written if `bits` and `bytes` of the image are those of the context's format, and
+    /// black otherwise, the image's own bounds holding then.
+    virtual void ReadImage(GrRect const& src, GrImage& image, int dx, int dy) = 0;
+
+    /// `DrawImageMasked` without clip, origin and lock: `dst` is in surface coordinates and must lie on the
+    /// surface. Callers that draw on the screen see to it themselves that nobody else does. An empty
+    /// rectangle is left alone.
+    virtual void DrawImageMaskedDirect(
+        GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) = 0;
+    /// `DrawImage` in the same way, for images in the context's own format only. An alpha plane is not looked
+    /// at.
+    virtual void DrawImageDirect(GrRect const& dst, GrImage const& image, int sx, int sy) = 0;
+    /// `DrawImageAlpha` in the same way, for true-colour images only; `image` is not null.
+    virtual void DrawImageAlphaDirect(
+        GrRect const& dst, GrImage const* image, int sx, int sy, GrBlendParams const& params) = 0;
+    /// `ReadImage` in the same way, for images in the context's own format only.
+    virtual void ReadImageDirect(GrRect const& src, GrImage& image, int dx, int dy) = 0;
+
+    /// Fills the rectangle `dst` from another context, whose point `sx`, `sy`, in its own context
+    /// coordinates, goes to the top left corner, converting each pixel. Where the source's `GetPixel` is 0,
+    /// outside its clip, too, the pixel becomes black. Within one surface, pixels are copied in the order in
+    /// which they are painted, and one that has been painted is copied as it is then. Contexts that cannot
+    /// copy do nothing.
     virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);
 };
 
 /// What contexts over images offer beyond `GrContext`.
 class GR_API GrContextI : public GrContext {
 public:
+    /// Fills the whole image from a stream of pixels: what `GrImage::Load` does, with the flags that the
+    /// image had when the context was made. `data` and `step` are as there.
+    virtual void LoadPixels(std::uint8_t const* data, unsigned step) = 0;
+    /// Fills the image from a stream of pixels as `LoadPixels` does, diffusing the errors of the conversion
+    /// whatever the flags say. `alpha` is null or holds one value for each pixel of the image: pixels with a
+    /// value below 255 are left alone. The fourth byte of a pixel of the stream is not looked at. Does nothing
+    /// in formats of 24 and 32 bits.
+    virtual void LoadPixelsDithered(std::uint8_t const* data, std::uint8_t const* alpha, unsigned step) = 0;
+    /// Writes the whole image as a stream of pixels: what `GrImage::Unload` does. `data` and `step` are as
+    /// there.
+    virtual void UnloadPixels(std::uint8_t* data, unsigned step) = 0;
+
     /// Puts both the base origin and the origin at surface point `x`, `y`.
     virtual void SetBaseOrigin(int x, int y) = 0;
     /// Sets the outermost bound of the clip, relative to the base origin, and resets the clip to it. It must

@@ -14,6 +14,7 @@ template <typename Colors>
 concept GrColorsPolicy = std::unsigned_integral<typename Colors::Pixel> &&
     std::same_as<decltype(Colors::ToPixel(GrColor{})), typename Colors::Pixel> &&
     std::same_as<decltype(Colors::FromPixel(typename Colors::Pixel{})), GrColor> &&
+    std::same_as<decltype(Colors::kBits), int const> &&    // the depth that images of the format have
     std::same_as<decltype(Colors::kDithers), bool const>;  // whether converting images diffuses the error
 
 /// The index 0 to 15 of the 16-colour palette's entry nearest to a colour; the lower index wins a tie.
@@ -22,6 +23,7 @@ int NearestPaletteIndex(GrColor color);
 /// 16 colours: an index into the standard VGA text palette.
 struct GrColors4 {
     using Pixel = std::uint8_t;
+    static constexpr int kBits = 4;
     static constexpr bool kDithers = true;
 
     static GrColor const palette[16];
@@ -45,6 +47,7 @@ struct GrColors4 {
 /// black and white; the other indices outside it run through the same arithmetic in 8 bits.
 struct GrColors8 {
     using Pixel = std::uint8_t;
+    static constexpr int kBits = 8;
     static constexpr bool kDithers = true;
 
     static constexpr Pixel ToPixel(GrColor c)
@@ -65,6 +68,7 @@ struct GrColors8 {
 /// 5-5-5: red in bits 10-14, green 5-9, blue 0-4. Reading only shifts, so white comes back as 0xF8F8F8.
 struct GrColors15 {
     using Pixel = std::uint16_t;
+    static constexpr int kBits = 15;
     static constexpr bool kDithers = true;
 
     static constexpr Pixel ToPixel(GrColor c)
@@ -81,6 +85,7 @@ struct GrColors15 {
 /// 5-6-5: red in bits 11-15, green 5-10, blue 0-4. Reading only shifts, so white comes back as 0xF8FCF8.
 struct GrColors16 {
     using Pixel = std::uint16_t;
+    static constexpr int kBits = 16;
     static constexpr bool kDithers = true;
 
     static constexpr Pixel ToPixel(GrColor c)
@@ -97,6 +102,7 @@ struct GrColors16 {
 /// The framebuffer's layout of true colour: blue, green, red in memory, then a zero byte or nothing.
 struct GrColors24 {
     using Pixel = std::uint32_t;
+    static constexpr int kBits = 24;
     static constexpr bool kDithers = false;
 
     static constexpr Pixel ToPixel(GrColor c) { return (c & 0xFF) << 16 | (c & 0xFF00) | (c >> 16 & 0xFF); }
@@ -106,6 +112,7 @@ struct GrColors24 {
 /// True-colour images: the colour itself.
 struct GrColorsRGB {
     using Pixel = std::uint32_t;
+    static constexpr int kBits = 32;
     static constexpr bool kDithers = false;
 
     static constexpr Pixel ToPixel(GrColor c) { return c; }
@@ -116,6 +123,7 @@ struct GrColorsRGB {
 /// an opaque 255 becomes 254.
 struct GrColorsRGBA {
     using Pixel = std::uint32_t;
+    static constexpr int kBits = 32;
     static constexpr bool kDithers = false;
 
     static constexpr Pixel ToPixel(GrColor c)

@@ -1,10 +1,38 @@
 #pragma once
 
+#include <common/assert.h>
+#include <tessella/bitmap.h>
 #include <tessella/coordinates.h>
+#include <tessella/pixel/blend_rows.h>
 #include <tessella/pixel/clip_walk.h>
+#include <tessella/pixel/color_source.h>
 #include <tessella/pixel/colors.h>
+#include <tessella/pixel/convert_rows.h>
 #include <tessella/pixel/generic_surface.h>
 #include <tessella/region_cut.h>
+
+/// A picture of one bit a pixel. Its rows begin `pitch` bytes apart, the leftmost pixel in the highest or the
+/// lowest bit of a byte; or, with a pitch of 0, follow each other bit by bit, always the lowest first.
+struct GrBits {
+    std::uint8_t const* data;
+    int width, height;
+    int pitch;
+    bool msbFirst;
+
+    bool IsSet(int row, int column) const
+    {
+        std::ptrdiff_t const index = pitch == 0 ? std::ptrdiff_t{row} * width + column
+            : msbFirst                          ? column ^ 7
+                                                : column;
+        return data[std::ptrdiff_t{row} * pitch + index / 8] >> index % 8 & 1;
+    }
+};
+
+inline GrBits BitsOf(GrBitmap const& bitmap)
+{
+    int const pitch = static_cast<int>((static_cast<unsigned>(bitmap.width) + 7) / 8);
+    return {bitmap.data, bitmap.width, bitmap.height, pitch, false};
+}
 
 /// The drawing operations that move pixel values converted once, when the colour was set. `S` is the surface
 /// layer: where the pixels lie, and how wide they are.
@@ -16,9 +44,36 @@ public:
     std::uint32_t GetRasterMode() override { return this->rasterMode; }
     void DrawPixel(int x, int y) override;
     void FillRegion(GrRegion const& region) override;
+    void FillRegionAlpha(GrRegion const& region, std::uint8_t alpha) override;
+    void DrawBitmap(int x, int y, GrBitmap const& bitmap) override;
+    void DrawBitmapTransparent(int x, int y, GrBitmap const& bitmap) override;
+    void DrawImageMasked(
+        GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) override;
+    void DrawImageMaskedDirect(
+        GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) override;
+    void DrawImageDirect(GrRect const& dst, GrImage const& image, int sx, int sy) override;
+    void ReadImageDirect(GrRect const& src, GrImage& image, int dx, int dy) override;
 
 protected:
     using S::S;
+
+    GrRect OnSurface(GrRect const& rect) const { return Moved(rect, this->originX, this->originY); }
+
+    /// Visits the clip within `target` (surface coordinates), range by range, with the screen's guard held:
+    /// `visit` gets the range's columns and rows and the source point that goes to its top left, while `sx`,
+    /// `sy` goes to that of the target.
+    template <typename Visit>
+    void WalkClip(GrRect const& target, int sx, int sy, Visit visit);
+
+    /// False for rectangles that select no pixel, or where there are none.
+    bool HasPixelsIn(GrRect const& rect) const { return !rect.IsEmpty() && this->HasPixels(); }
+
+    void MaskedRows(
+        GrRange xRange, GrRange yRange, GrImage const& image, GrBitmap const& mask, int sx, int sy) const;
+
+    /// Paints bits from surface point `x`, `y` on: set ones through pattern and raster mode and no others, or
+    /// all of them in the fore and back colour.
+    void DrawBits(int x, int y, GrBits const& bits, bool transparent);
 };
 
 /// The drawing operations that convert between colours and pixels.
@@ -34,6 +89,34 @@ public:
     void SetBackColor(GrColor color) override { this->backColor = Colors::ToPixel(color); }
     void SetForeColor(GrColor color) override { this->foreColor = Colors::ToPixel(color); }
     GrColor GetPixel(int x, int y) override;
+    void DrawImage(GrRect const& dst, GrImage const& image, int sx, int sy) override;
+    void DrawImageAlpha(
+        GrRect const& dst, GrImage const* image, int sx, int sy, GrBlendParams const& params) override;
+    void ReadImage(GrRect const& src, GrImage& image, int dx, int dy) override;
+    void DrawImageAlphaDirect(
+        GrRect const& dst, GrImage const* image, int sx, int sy, GrBlendParams const& params) override;
+    void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy) override;
+
+    /// For others to copy from: where the pixels lie that the clip lets through, and what `GetPixel` yields
+    /// for `count` pixels from `x`, `y` on.
+    GrPixelExtent ExtentOfClip() const;
+    void ReadClipped(int x, int y, int count, GrColor* colors) const;
+
+private:
+    static constexpr int kColorsAtOnce = 256;
+    static constexpr char kSource[] = GR_SOURCE("tessella/context");
+
+    /// All other images are converted pixel by pixel.
+    static bool HasOwnFormat(GrImage const& image)
+    {
+        return image.bits == Colors::kBits && image.bytes == S::kBytes;
+    }
+
+    void BlendRange(GrRange xRange, GrRange yRange, GrImage const* image, int sx, int sy,
+        GrBlendParams const& params) const;
 };
 
+#include <tessella/pixel/context_bits.inl>
+#include <tessella/pixel/context_blend.inl>
+#include <tessella/pixel/context_convert.inl>
 #include <tessella/pixel/context_fill.inl>

@@ -17,6 +17,7 @@
 template <typename Base, GrSurfacePolicy Surface>
 class GrGenericSurface : public Base, private Surface {
 public:
+    using Width = Surface;
     using Surface::kAllBits;
     using Surface::kBytes;
     using typename Surface::Pixel;

@@ -52,6 +52,7 @@ template <typename Base, GrSurfacePolicy Surface>
 void GrGenericSurface<Base, Surface>::CopyRowsIn(
     GrRange xRange, GrRange yRange, GrImage const& image, int sx, int sy) const
 {
+    if (!image.pixels) return;
     std::ptrdiff_t const imageStride = std::ptrdiff_t{image.width} * kBytes;
     std::size_t const length = static_cast<std::size_t>(xRange.r2 - xRange.r1) * kBytes;
     unsigned char const* source = image.pixels + sy * imageStride + std::ptrdiff_t{sx} * kBytes;
@@ -64,6 +65,7 @@ template <typename Base, GrSurfacePolicy Surface>
 void GrGenericSurface<Base, Surface>::CopyRowsOut(
     GrRange xRange, GrRange yRange, GrImage& image, int dx, int dy) const
 {
+    if (!image.pixels) return;
     std::ptrdiff_t const imageStride = std::ptrdiff_t{image.width} * kBytes;
     std::size_t const length = static_cast<std::size_t>(xRange.r2 - xRange.r1) * kBytes;
     unsigned char* target = image.pixels + dy * imageStride + std::ptrdiff_t{dx} * kBytes;

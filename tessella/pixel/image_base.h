@@ -59,4 +59,5 @@ protected:
     bool HasPixels() const { return pixels != nullptr; }
     unsigned char* PixelBase() const { return pixels; }
     std::ptrdiff_t Stride() const { return stride; }
+    std::int32_t* ErrorRows() const { return ditherRows.get(); }
 };

@@ -34,4 +34,5 @@ protected:
     static bool HasPixels();
     static unsigned char* PixelBase() { return GrScreen.fbMemory; }
     static std::ptrdiff_t Stride() { return GrScreen.stride; }
+    static std::int32_t* ErrorRows() { return GrScreen.ditherLine; }
 };

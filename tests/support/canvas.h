@@ -13,18 +13,29 @@
 class Canvas {
 public:
     struct Format {
-        int bytes;
+        int bits, bytes;
+        bool dithers;
         std::uint32_t allBits;
         std::function<std::uint32_t(GrColor)> toPixel;
         std::function<GrColor(std::uint32_t)> fromPixel;
     };
+    template <typename Surface, typename Colors>
+    static Format FormatOf(int bits = Colors::kBits)
+    {
+        return {bits, Surface::kBytes, Colors::kDithers, Surface::kAllBits,
+            [](GrColor c) { return Colors::ToPixel(c); },
+            [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); }};
+    }
 
+    Format const format;
     std::vector<unsigned char> memory;
+    int originX = 0, originY = 0;
+    std::uint32_t fore = 0, back;
 
     Canvas(Format pixelFormat, int surfaceWidth, int surfaceHeight, int surfaceStride)
-        : memory(static_cast<std::size_t>(surfaceStride * surfaceHeight)), format(std::move(pixelFormat)),
-          width(surfaceWidth), height(surfaceHeight), stride(surfaceStride),
-          limit(static_cast<std::size_t>(width * height), true), clip(limit), back(format.allBits)
+        : format(std::move(pixelFormat)), memory(static_cast<std::size_t>(surfaceStride * surfaceHeight)),
+          back(format.allBits), width(surfaceWidth), height(surfaceHeight), stride(surfaceStride),
+          limit(static_cast<std::size_t>(width * height), true), clip(limit)
     {}
 
     void SetClipRegion(GrRegion const& region)
@@ -77,9 +88,25 @@ public:
         x += originX;
         y += originY;
         if (!InClip(x, y)) return 0;
+        return format.fromPixel(Read(x, y));
+    }
+
+    /// A pixel of the surface, wherever the clip lies; and painting it within the clip.
+    std::uint32_t Read(int x, int y) const
+    {
         std::uint32_t pixel = 0;
         std::memcpy(&pixel, memory.data() + Offset(x, y), static_cast<std::size_t>(format.bytes));
-        return format.fromPixel(pixel);
+        return pixel;
+    }
+    void Write(int x, int y, std::uint32_t pixel)
+    {
+        std::memcpy(memory.data() + Offset(x, y), &pixel, static_cast<std::size_t>(format.bytes));
+    }
+    void Paint(int x, int y)
+    {
+        if (!InClip(x, y)) return;
+        bool const set = pattern[y % 8][x % 8];
+        if (set || !transparent) Write(x, y, copies ? (set ? fore : back) : ~Read(x, y));
     }
 
 private:
@@ -95,22 +122,10 @@ private:
         return x >= 0 && y >= 0 && x < width && y < height && clip[static_cast<std::size_t>(y * width + x)];
     }
     std::size_t Offset(int x, int y) const { return static_cast<std::size_t>(y * stride + x * format.bytes); }
-    void Paint(int x, int y)
-    {
-        if (!InClip(x, y)) return;
-        bool const set = pattern[y % 8][x % 8];
-        if (!set && transparent) return;
-        unsigned char* const bytes = memory.data() + Offset(x, y);
-        for (int i = 0; i < format.bytes; ++i)
-            bytes[i] = static_cast<unsigned char>(copies ? (set ? fore : back) >> 8 * i : ~bytes[i]);
-    }
 
-    Format format;
     int width, height, stride;
     std::vector<bool> limit, clip;
     int baseX = 0, baseY = 0;
-    int originX = 0, originY = 0;
-    std::uint32_t fore = 0, back;
     bool pattern[8][8] = {{1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1},
         {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1},
         {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}};

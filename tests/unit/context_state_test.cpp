@@ -113,14 +113,20 @@ std::size_t Slot(Pointer function)
 TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
 {
     std::size_t slot = 2;  // behind the two entries of the destructor
-    for (std::size_t const actual :
-        {Slot(&GrContext::SetClipRegion), Slot(&GrContext::GetClipRegion), Slot(&GrContext::ExcludeClipRect),
-            Slot(&GrContext::ExcludeClipRegion), Slot(&GrContext::ResetClipRegion),
-            Slot(&GrContext::GetClipRect), Slot(&GrContext::SetOrigin), Slot(&GrContext::GetOrigin),
-            Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor), Slot(&GrContext::SetPattern),
-            Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode), Slot(&GrContext::GetPixel),
-            Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion), Slot(&GrContext::CopyFromContext),
-            Slot(&GrContextI::SetBaseOrigin), Slot(&GrContextI::SetLimitRegion)})
+    for (std::size_t const actual : {Slot(&GrContext::SetClipRegion), Slot(&GrContext::GetClipRegion),
+             Slot(&GrContext::ExcludeClipRect), Slot(&GrContext::ExcludeClipRegion),
+             Slot(&GrContext::ResetClipRegion), Slot(&GrContext::GetClipRect), Slot(&GrContext::SetOrigin),
+             Slot(&GrContext::GetOrigin), Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor),
+             Slot(&GrContext::SetPattern), Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode),
+             Slot(&GrContext::GetPixel), Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion),
+             Slot(&GrContext::FillRegionAlpha), Slot(&GrContext::DrawBitmap),
+             Slot(&GrContext::DrawBitmapTransparent), Slot(&GrContext::DrawImageMasked),
+             Slot(&GrContext::DrawImage), Slot(&GrContext::DrawImageAlpha), Slot(&GrContext::ReadImage),
+             Slot(&GrContext::DrawImageMaskedDirect), Slot(&GrContext::DrawImageDirect),
+             Slot(&GrContext::DrawImageAlphaDirect), Slot(&GrContext::ReadImageDirect),
+             Slot(&GrContext::CopyFromContext), Slot(&GrContextI::LoadPixels),
+             Slot(&GrContextI::LoadPixelsDithered), Slot(&GrContextI::UnloadPixels),
+             Slot(&GrContextI::SetBaseOrigin), Slot(&GrContextI::SetLimitRegion)})
         EXPECT_EQ(actual, slot++);
 }
 

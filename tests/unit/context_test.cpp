@@ -18,13 +18,6 @@ namespace {
 
 constexpr int kWidth = 53, kHeight = 37;
 
-template <typename Surface, typename Colors>
-Canvas::Format FormatOf()
-{
-    return {Surface::kBytes, Surface::kAllBits, [](GrColor c) { return Colors::ToPixel(c); },
-        [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); }};
-}
-
 class RandomDrawing {
 public:
     RandomDrawing(GrContext& drawnContext, Canvas& judgingCanvas, unsigned seed)
@@ -121,7 +114,7 @@ void Judge(GrContext& context, unsigned char const* pixels, Canvas& canvas)
 template <typename Surface, typename Colors>
 void JudgeImage()
 {
-    Canvas canvas(FormatOf<Surface, Colors>(), kWidth, kHeight, kWidth * Surface::kBytes);
+    Canvas canvas(Canvas::FormatOf<Surface, Colors>(), kWidth, kHeight, kWidth * Surface::kBytes);
     GrImage image(kWidth, kHeight, new unsigned char[canvas.memory.size()](), nullptr, 0);
     std::unique_ptr<GrContext> const context(CreateImageContext<Surface, Colors>(&image));
     Judge(*context, image.pixels, canvas);
@@ -151,7 +144,7 @@ void JudgeScreen(unsigned bits, unsigned colorBits)
 {
     SCOPED_TRACE(bits * 100 + colorBits);
     int const stride = kWidth * Surface::kBytes + 5;
-    Canvas canvas(FormatOf<Surface, Colors>(), kWidth, kHeight, stride);
+    Canvas canvas(Canvas::FormatOf<Surface, Colors>(), kWidth, kHeight, stride);
     std::vector<unsigned char> memory(canvas.memory.size());
     ResetScreen const reset;
     GrScreen.fbMemory = memory.data();
@@ -224,6 +217,9 @@ struct Rows : GrGenericContext<GrGenericSurface<GrImageContextBase<3>, GrSurface
     using GrGenericSurface::CopyRowsIn;
     using GrGenericSurface::CopyRowsOut;
     using GrGenericSurface::PatternColumn;
+    void LoadPixels(std::uint8_t const*, unsigned) override {}
+    void LoadPixelsDithered(std::uint8_t const*, std::uint8_t const*, unsigned) override {}
+    void UnloadPixels(std::uint8_t*, unsigned) override {}
 };
 
 TEST(Rows, CopyBetweenSurfaceAndImageOfTheSameFormat)

@@ -1,5 +1,7 @@
 tessella_test(NAME pixel_test LABEL unit SOURCES
+    blit_test.cpp
     colors_test.cpp
     context_test.cpp
     context_state_test.cpp
+    image_stream_test.cpp
     image_test.cpp)

@@ -1,0 +1,35 @@
+#pragma once
+
+#include <tessella/color.h>
+
+class GrContext;
+
+/// The addresses of some pixels, from the first to behind the last.
+struct GrPixelExtent {
+    unsigned char const* begin;
+    unsigned char const* end;
+
+    bool Meets(GrPixelExtent const& other) const { return begin < other.end && other.begin < end; }
+};
+
+/// A context to copy colours from. Those of the library's own classes give many at a time, the same that their
+/// `GetPixel` would.
+class GrColorSource {
+public:
+    explicit GrColorSource(GrContext& copied);
+
+    /// True if colours may be read before some pixels are written: they are not the source's own. Of contexts
+    /// of other classes nothing is known, and they are asked pixel by pixel.
+    bool MayReadAhead(GrPixelExtent const& written) const { return read && !extent.Meets(written); }
+
+    /// `count` colours from context point `x`, `y` on; 0 outside the clip.
+    void Read(int x, int y, int count, GrColor* colors) const { read(source, x, y, count, colors); }
+
+private:
+    template <typename Context>
+    bool IsOf();
+
+    GrContext& source;
+    GrPixelExtent extent{};
+    void (*read)(GrContext& source, int x, int y, int count, GrColor* colors) = nullptr;
+};

@@ -1,0 +1,85 @@
+#include <algorithm>
+#include <memory>
+
+template <typename S, GrColorsPolicy Colors>
+void GrGenericContext<S, Colors>::DrawImage(GrRect const& dst, GrImage const& image, int sx, int sy)
+{
+    if (image.alphaPlane) {
+        bool const overDestination = !(image.flags & GrImageOverBack);
+        bool const dither = Colors::kDithers && !(image.flags & GrImageNoDither);
+        this->DrawImageAlpha(dst, &image, sx, sy, {overDestination, dither, false, 0});
+    } else if (!HasOwnFormat(image)) {
+        std::unique_ptr<GrContext> const source(image.GetContext());
+        if (source) GrGenericContext::CopyFromContext(dst, source.get(), sx, sy);
+    } else {
+        this->WalkClip(
+            this->OnSurface(dst), sx, sy, [&](GrRange xRange, GrRange yRange, int imageX, int imageY) {
+                this->CopyRowsIn(xRange, yRange, image, imageX, imageY);
+            });
+    }
+}
+
+template <typename S, GrColorsPolicy Colors>
+void GrGenericContext<S, Colors>::ReadImage(GrRect const& src, GrImage& image, int dx, int dy)
+{
+    if (!HasOwnFormat(image)) {
+        std::unique_ptr<GrContext> const target(image.GetContext());
+        GrRect const dst{dx, dy, SourceOf(dx, src.x2, src.x1), SourceOf(dy, src.y2, src.y1)};
+        if (target) target->CopyFromContext(dst, this, src.x1, src.y1);
+    } else {
+        this->WalkClip(
+            this->OnSurface(src), dx, dy, [&](GrRange xRange, GrRange yRange, int imageX, int imageY) {
+                this->CopyRowsOut(xRange, yRange, image, imageX, imageY);
+            });
+    }
+}
+
+template <typename S, GrColorsPolicy Colors>
+GrPixelExtent GrGenericContext<S, Colors>::ExtentOfClip() const
+{
+    GrRect outer;
+    this->clip.GetOuterRect(outer);
+    if (!this->HasPixelsIn(outer)) return {nullptr, nullptr};
+    return {this->RowAddress(outer.y1), this->RowAddress(outer.y2)};
+}
+
+template <typename S, GrColorsPolicy Colors>
+void GrGenericContext<S, Colors>::ReadClipped(int x, int y, int count, GrColor* colors) const
+{
+    std::fill_n(colors, count, GrColor{0});
+    int const left = Moved(x, this->originX), right = Moved(left, count), row = Moved(y, this->originY);
+    GrRegion::Band const* const band = this->clip.FindBand(row);
+    if (!band || !this->HasPixels()) return;
+    for (auto const& range : RangesOf(*band)) {
+        int const from = std::max(range.r1, left), to = std::min(range.r2, right);
+        if (from >= to) continue;
+        typename S::Guard const guard(GrRect{from, row, to, row + 1});
+        ReadColors<typename S::Width, Colors>(
+            this->PixelAddress(this->RowAddress(row), from), to - from, colors + (from - left));
+    }
+}
+
+template <typename S, GrColorsPolicy Colors>
+void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy)
+{
+    GrColorSource const colorSource(*source);
+    bool const readAhead = colorSource.MayReadAhead(ExtentOfClip());
+    this->WalkClip(
+        this->OnSurface(dst), sx, sy, [&](GrRange xRange, GrRange yRange, int sourceX, int sourceY) {
+            unsigned char* row = this->RowAddress(yRange.r1);
+            for (int y = 0; y < yRange.r2 - yRange.r1; ++y, row += this->Stride()) {
+                GrColor colors[kColorsAtOnce];
+                int atOnce = 1;
+                for (int x = xRange.r1; x < xRange.r2; x += atOnce) {
+                    int const column = Moved(sourceX, x - xRange.r1);
+                    if (readAhead) {
+                        atOnce = std::min(xRange.r2 - x, kColorsAtOnce);
+                        colorSource.Read(column, Moved(sourceY, y), atOnce, colors);
+                    } else {
+                        colors[0] = source->GetPixel(column, Moved(sourceY, y));
+                    }
+                    WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), atOnce, colors);
+                }
+            }
+        });
+}

@@ -4,6 +4,7 @@
 #include <tessella/bitmap.h>
 #include <tessella/color.h>
 #include <tessella/context.h>
+#include <tessella/cursor.h>
 #include <tessella/event.h>
 #include <tessella/export.h>
 #include <tessella/image.h>

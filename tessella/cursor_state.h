@@ -2,9 +2,15 @@
 
 #include <atomic>
 
-/// The pointer is to be seen on the screen. Changed by whoever hides or shows it: the application's thread.
+class GrCursor;
+
+/// The cursor that follows the pointer; null if none does. Changed under `screenMutex`, and by a change of
+/// mode.
+extern std::atomic<GrCursor*> currentCursor;
+
+/// The pointer is to be seen: the current cursor, if there is one, is drawn on the screen.
 extern std::atomic<bool> cursorVisible;
 
-/// Take the pointer's picture onto the screen and off it.
+/// Take the current cursor onto the screen and off it.
 void GrShowCursor();
 void GrHideCursor();

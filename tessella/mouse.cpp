@@ -1,5 +1,6 @@
 #include <tessella/mouse.h>
 
+#include <tessella/cursor.h>
 #include <tessella/cursor_state.h>
 #include <tessella/event.h>
 #include <tessella/event_wait_l.h>
@@ -20,15 +21,11 @@ std::uint32_t emulatedButtons = 7;
 int mouseFd = -1;
 bool mouseWheel = false;
 constinit std::atomic<bool> mouseRefreshPending{false};
+constinit std::atomic<int> mouseX{0}, mouseY{0};
 
 namespace {
 
-// Shared between the threads without more order than each value's own: whoever reports computes the new
-// position before it locks.
-using Shared = std::atomic<int>;
 constexpr auto kRelaxed = std::memory_order_relaxed;
-
-Shared mouseX{0}, mouseY{0};
 
 /// A side of the screen, which a change of mode may be about to alter.
 int Side(std::uint32_t& side) { return static_cast<int>(std::atomic_ref(side).load(kRelaxed)); }
@@ -105,6 +102,8 @@ std::uint32_t ButtonKind(std::uint32_t before, std::uint32_t now, std::uint32_t 
 bool GrMousePush(std::uint32_t kinds, std::uint32_t buttons, int x, int y)
 {
     if (kinds & GrEventMouseMove) {
+        std::scoped_lock const lock(screenMutex);
+        if (GrCursor* const cursor = currentCursor) cursor->Move(x, y);
         mouseX.store(x, kRelaxed);
         mouseY.store(y, kRelaxed);
     }
@@ -230,4 +229,5 @@ void GrMouseRecentre()
     }
     std::scoped_lock const lock(std::adopt_lock, mouseMutex);
     CentrePointer();
+    currentCursor = nullptr;
 }

@@ -16,6 +16,10 @@ extern std::mutex mouseMutex;
 extern std::atomic<std::uint32_t> mouseButtons;  ///< as last reported, by whichever thread reports
 extern std::uint32_t emulatedButtons;            ///< as last reported by the keyboard
 
+/// Where the pointer is, in screen coordinates, one past the edge at most. Changed under the mutex; read
+/// anywhere, where a value that is about to change does no harm.
+extern std::atomic<int> mouseX, mouseY;
+
 extern int mouseFd;      ///< the mouse device; -1 before it is opened; fixed before the thread starts
 extern bool mouseWheel;  ///< the device reports its wheel; fixed before the thread starts
 

@@ -26,4 +26,9 @@ public:
 
     GrScreenGuard(GrScreenGuard const&) = delete;
     GrScreenGuard& operator=(GrScreenGuard const&) = delete;
+
+private:
+    template <typename Area>
+    static void Enter(Area const& area);
+    static void PutCursorBack();
 };

@@ -152,8 +152,8 @@ public:
     virtual void LoadPixels(std::uint8_t const* data, unsigned step) = 0;
     /// Fills the image from a stream of pixels as `LoadPixels` does, diffusing the errors of the conversion
     /// whatever the flags say. `alpha` is null or holds one value for each pixel of the image: pixels with a
-    /// value below 255 are left alone. The fourth byte of a pixel of the stream is not looked at. Does nothing
-    /// in formats of 24 and 32 bits.
+    /// value below 255 are left alone. The fourth byte of a pixel of the stream is not looked at. Does
+    /// nothing in formats of 24 and 32 bits.
     virtual void LoadPixelsDithered(std::uint8_t const* data, std::uint8_t const* alpha, unsigned step) = 0;
     /// Writes the whole image as a stream of pixels: what `GrImage::Unload` does. `data` and `step` are as
     /// there.

@@ -2,9 +2,7 @@
 
 #include <tessella/pixel/wide.h>
 
-#ifdef __SSE2__
 #include <emmintrin.h>
-#endif
 
 // Error diffusion of sixteen rows at a time. A pixel waits for its left neighbour and for the one above, so
 // what can be done at once lies on a slope: each row is a column behind the row above it.
@@ -50,14 +48,8 @@ struct WavePart16 {
     }
     GR_INLINE static Vector Wanted(Vector const& color, Vector const& above, Vector const& left)
     {
-#ifdef __SSE2__
-        __m128i const errors = _mm_avg_epu8((__m128i)above, (__m128i)left);
+        __m128i const errors = _mm_avg_epu8((__m128i)above, (__m128i)left);  // both are even
         return (Vector)_mm_adds_epu8((__m128i)color, errors);
-#else
-        Vector const errors = (Vector)((FourWords)(above + left) >> 1);
-        Vector const room = ~errors;
-        return (color < room ? color : room) + errors;
-#endif
     }
     GR_INLINE static Vector ErrorsOf(Vector const& wanted) { return (Vector)((FourWords)wanted & kLost); }
 };
@@ -66,7 +58,6 @@ struct WavePart16 {
 struct WavePart8 {
     using Vector = std::int16_t __attribute__((vector_size(16)));
     using Mask = Vector;
-    using Unsigned = std::uint16_t __attribute__((vector_size(16)));
     using Pair = std::uint64_t __attribute__((vector_size(16)));
     using Cell = std::uint64_t;
     static constexpr int kParts = 2;
@@ -97,14 +88,15 @@ struct WavePart8 {
     }
     GR_INLINE static Vector Wanted(Vector const& color, Vector const& above, Vector const& left)
     {
-        Vector const sum = color + above + left;
-        Vector const limited = sum < 255 ? sum : Vector{} + 255;
-        return limited > 0 ? limited : Vector{};
+        __m128i const sum = (__m128i)(color + above + left);
+        return (Vector)_mm_max_epi16(_mm_min_epi16(sum, _mm_set1_epi16(255)), _mm_setzero_si128());
     }
     GR_INLINE static Vector ErrorsOf(Vector const& wanted)
     {
-        Vector const level = (Vector)((Unsigned)(wanted + 25) * 161 >> 13);
-        Vector const lost = wanted - level * 51;
+        // Products / 2^16: 1286 stands for 2^16 / 51, and the level comes shifted by 8, as does 51.
+        __m128i const level = _mm_mulhi_epu16((__m128i)(wanted + 25), _mm_set1_epi16(1286));
+        __m128i const reached = _mm_mulhi_epu16(_mm_slli_epi16(level, 8), _mm_set1_epi16(51 << 8));
+        Vector const lost = wanted - (Vector)reached;
         return (lost - (lost >> 15)) >> 1;  // toward zero
     }
 };

@@ -2,6 +2,8 @@
 
 #include <tessella/pixel/wide.h>
 
+#include <emmintrin.h>
+
 // Error diffusion of sixteen rows at a time. A pixel waits for its left neighbour and for the one above, so
 // what can be done at once lies on a slope: each row is a column behind the row above it.
 //
@@ -27,9 +29,9 @@ using FourRows = std::uint8_t __attribute__((vector_size(16)));
 using FourWords = std::uint32_t __attribute__((vector_size(16)));
 
 /// For 15 and 16 bits. Their pixels are never brighter than the colour that was wanted, so that no error is
-/// negative and all fit into bytes: `kHalves` are the bits that a pixel leaves over, but for the lowest of
-/// each channel.
-template <std::uint32_t kHalves>
+/// negative and all fit into bytes. They are kept twice as large as they are handed on: as the bits `kLost` that
+/// a pixel leaves over, but for the lowest of each channel.
+template <std::uint32_t kLost>
 struct WavePart16 {
     using Vector = FourRows;
     using Mask = std::int8_t __attribute__((vector_size(16)));
@@ -44,22 +46,18 @@ struct WavePart16 {
     {
         return (Vector)__builtin_shufflevector((FourWords)above, (FourWords)errors, 3, 4, 5, 6);
     }
-    GR_INLINE static Vector Wanted(Vector const& color, Vector const& errors)
+    GR_INLINE static Vector Wanted(Vector const& color, Vector const& above, Vector const& left)
     {
-        Vector const room = ~errors;
-        return (color < room ? color : room) + errors;
+        __m128i const errors = _mm_avg_epu8((__m128i)above, (__m128i)left);  // both are even
+        return (Vector)_mm_adds_epu8((__m128i)color, errors);
     }
-    GR_INLINE static Vector HalfLost(Vector const& wanted)
-    {
-        return (Vector)(((FourWords)wanted & kHalves) >> 1);
-    }
+    GR_INLINE static Vector ErrorsOf(Vector const& wanted) { return (Vector)((FourWords)wanted & kLost); }
 };
 
 /// For the cube of 8 bits: two rows of 16 bits a channel, with errors of both signs.
 struct WavePart8 {
     using Vector = std::int16_t __attribute__((vector_size(16)));
     using Mask = Vector;
-    using Unsigned = std::uint16_t __attribute__((vector_size(16)));
     using Pair = std::uint64_t __attribute__((vector_size(16)));
     using Cell = std::uint64_t;
     static constexpr int kParts = 2;
@@ -88,16 +86,17 @@ struct WavePart8 {
     {
         return (Vector)__builtin_shufflevector((Pair)above, (Pair)errors, 1, 2);
     }
-    GR_INLINE static Vector Wanted(Vector const& color, Vector const& errors)
+    GR_INLINE static Vector Wanted(Vector const& color, Vector const& above, Vector const& left)
     {
-        Vector const sum = color + errors;
-        Vector const limited = sum < 255 ? sum : Vector{} + 255;
-        return limited > 0 ? limited : Vector{};
+        __m128i const sum = (__m128i)(color + above + left);
+        return (Vector)_mm_max_epi16(_mm_min_epi16(sum, _mm_set1_epi16(255)), _mm_setzero_si128());
     }
-    GR_INLINE static Vector HalfLost(Vector const& wanted)
+    GR_INLINE static Vector ErrorsOf(Vector const& wanted)
     {
-        Vector const level = (Vector)((Unsigned)(wanted + 25) * 161 >> 13);
-        Vector const lost = wanted - level * 51;
+        // Products / 2^16: 1286 stands for 2^16 / 51, and the level comes shifted by 8, as does 51.
+        __m128i const level = _mm_mulhi_epu16((__m128i)(wanted + 25), _mm_set1_epi16(1286));
+        __m128i const reached = _mm_mulhi_epu16(_mm_slli_epi16(level, 8), _mm_set1_epi16(51 << 8));
+        Vector const lost = wanted - (Vector)reached;
         return (lost - (lost >> 15)) >> 1;  // toward zero
     }
 };
@@ -159,21 +158,21 @@ public:
 private:
     /// Four steps of some rows. Their errors come in from the row above and go out to the row below.
     GR_INLINE static void RunPart(FourWords const (&lines)[4], int part, Vector (&wanted)[4][Part::kParts],
-        Vector (&errors)[4], Vector& toRight, Vector& toBelow)
+        Vector (&passing)[4], Vector& toRight, Vector& toBelow)
     {
         using Signs = std::int32_t __attribute__((vector_size(16)));
         for (int i = 0; i < 4; ++i) {
-            Vector const fromAbove = Part::Shift(errors[i], toBelow);
-            errors[i] = toBelow;
+            Vector const fromAbove = Part::Shift(passing[i], toBelow);
+            passing[i] = toBelow;
             Vector const color = Part::Expand((FourRows)lines[i], part);
-            wanted[i][part] = Part::Wanted(color, fromAbove + toRight);
-            Vector const half = Part::HalfLost(wanted[i][part]);
+            wanted[i][part] = Part::Wanted(color, fromAbove, toRight);
+            Vector const errors = Part::ErrorsOf(wanted[i][part]);
             if constexpr (kSkips) {
                 auto const drawn = Part::Spread((FourRows)((Signs)lines[i] < 0), part);
-                toRight = drawn ? half : toRight;
-                toBelow = drawn ? half : fromAbove;
+                toRight = drawn ? errors : toRight;
+                toBelow = drawn ? errors : fromAbove;
             } else {
-                toRight = toBelow = half;
+                toRight = toBelow = errors;
             }
         }
     }

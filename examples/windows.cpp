@@ -160,7 +160,7 @@ int main(int, char** argv)
     GrWindow* dragged = nullptr;
     int grabX = 0, grabY = 0;  // where on it the pointer holds the dragged window
     for (GrEvent event;;) {
-        if (!GrGetEvent(event, nullptr)) continue;
+        if (!GrGetEvent(event, nullptr) || !event.window) continue;  // keys belong to no window
         GrWindow& window = *event.window;
         bool const onGround = !window.parent;
         if (event.type == GrEventPaint) {

@@ -2,7 +2,9 @@
 
 #include <tessella/event.h>
 
+#include <algorithm>
 #include <cstdint>
+#include <limits>
 
 #include <pthread.h>
 
@@ -17,13 +19,15 @@ pthread_cond_t eventCond = PTHREAD_COND_INITIALIZER;
 std::uint32_t wakeCount = 0;
 bool unfreezeFlag = false;
 
-/// Applications count milliseconds in the field for microseconds, and seconds beside them.
+/// Applications count milliseconds in the field for microseconds, and seconds beside them; some mean for ever
+/// by more seconds than a clock can hold.
 timespec Deadline(timeval const& timeout)
 {
     timeval now{};
     gettimeofday(&now, nullptr);
+    auto const seconds = std::min(timeout.tv_sec, std::numeric_limits<time_t>::max() / 2);
     auto const microseconds = timeout.tv_usec % 1000 * 1000 + now.tv_usec;
-    return {timeout.tv_sec + now.tv_sec + microseconds / 1'000'000, microseconds % 1'000'000 * 1000};
+    return {seconds + now.tv_sec + microseconds / 1'000'000, microseconds % 1'000'000 * 1000};
 }
 
 /// Under eventMutex. True if the caller is to leave.

@@ -52,6 +52,7 @@ void* ReadMouse(void*)
 
 void GrMouseOpen()
 {
+    if (mouseFd != -1) return;
     for (char const* const device : {"/dev/mice", "/dev/input/mice"})
         if (mouseFd == -1) mouseFd = open(device, O_RDWR);
     if (mouseFd == -1) return;

@@ -8,13 +8,14 @@
 /// threads run with all of them blocked.
 class InputThread {
 public:
-    /// Runs `body` with `argument` on a thread of its own. False if the system refuses a pipe or a thread.
+    /// Runs `body` with `argument` on a thread of its own. False if the system refuses a pipe or a thread:
+    /// the device is then not heard, which is all that can be done about it.
     bool Start(void* (*body)(void*), void* argument);
 
     /// Tells the thread to end and waits until it has. Only once after a start.
     void Stop();
 
-    /// True from the start on, for ever: there is one such thread a process.
+    /// True from a start on, for ever: a device has one session a process.
     bool WasStarted() const { return started; }
 
     /// Waits until the device can be read; false if the thread is to end. On the thread itself.

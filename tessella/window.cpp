@@ -112,6 +112,11 @@ GrWindow::~GrWindow()
     GR_ASSERT_TEXT(!first, "first == 0");
     GR_ASSERT_TEXT(!last, "last == 0");
     GR_ASSERT_TEXT(Callback, "Callback != 0");
+    while (first) {
+        GrWindow& orphan = *first;
+        Unlink(orphan);
+        orphan.parent = nullptr;
+    }
     Send(GrEventWindowDestroyed, this);
     if (IsVisible()) FullInvalidate(false);
     RemoveFromParent();
@@ -139,6 +144,7 @@ void GrWindow::SetParent(GrWindow* newParent)
 {
     GR_ASSERT_TEXT(newParent, "nparent!=0");
     RemoveFromParent();
+    if (this == &Screen) return;  // a root with a parent would run in circles
     parent = newParent;
     InsertToParent();
 }

@@ -91,6 +91,7 @@ void GrWindow::Lower()
 GrContext* GrWindow::GetContext()
 {
     if (context) return context;
+    if (!GrScreen.createScreenContext) return nullptr;
     GrRegion clip;
     DoGetClipRegion(clip, nullptr, false, true);
     return GrScreen.createScreenContext(clip, bounds.x1, bounds.y1);
@@ -98,6 +99,7 @@ GrContext* GrWindow::GetContext()
 
 GrContext* GrWindow::GetNonclipContext()
 {
+    if (!GrScreen.createScreenContext) return nullptr;
     GrRegion clip;
     DoGetClipRegion(clip, first, false, false);
     return GrScreen.createScreenContext(clip, bounds.x1, bounds.y1);

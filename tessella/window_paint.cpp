@@ -99,7 +99,7 @@ void GrWindow::ResetInvalidated()
 bool GrWindow::GetPaintEvent(GrEvent* event)
 {
     if (!screenVisible) return false;
-    GR_ASSERT_TEXT(Screen.IsVisible(), "Screen->IsVisible()");
+    if (!GR_ASSERT_TEXT(Screen.IsVisible(), "Screen->IsVisible()")) return false;
     GrRegion area = Screen.bounds;
     return GetPaintEvent(event, area);
 }
@@ -115,8 +115,8 @@ bool GrWindow::GetPaintEvent(GrEvent* event, GrRegion& area)
 // The argument has never limited anything, and applications rely on all paint being delivered.
 void GrWindow::Repaint(GrRegion const&)
 {
-    if (!screenVisible) return;
+    if (!screenVisible || !Callback) return;
     GrEvent event;
     while (GetPaintEvent(&event))
-        if (Callback) Callback(event);
+        Callback(event);
 }

@@ -2,8 +2,9 @@
 
 #include <tessella/window.h>
 
-/// What all windows share. The application's thread only, like the tree itself.
+// What all windows share. The application's thread only, like the tree itself.
 
+/// The one window that has no parent, so that nobody else can make one.
 struct GrRootWindow : GrWindow {};
 
 /// The root of the tree. Visible during a session; its corner stays at 0, 0.

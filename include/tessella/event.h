@@ -72,7 +72,8 @@ struct GrEvent {
 /// If there is no event it waits, letting other threads have the library meanwhile (`GrGrabInput`).
 ///
 /// `timeout` limits the wait: null means no limit, and {0, 0} not to wait at all. Attention: `tv_usec` counts
-/// milliseconds, and only its value modulo 1000 is used. Input that gives no event begins the wait anew.
+/// milliseconds, and only its value modulo 1000 is used. Input that gives no event begins the wait anew. A
+/// time that is negative is over at once.
 ///
 /// False if `event` holds no event: time ran out, `GrUnfreeze` was called, or input came whose events had
 /// been taken before. So false does not mean that time ran out; the loop of the application calls again.
@@ -91,8 +92,8 @@ GR_API bool GrHasEvent();
 GR_API void GrGetCursorPos(int& x, int& y, unsigned& buttons);
 
 /// Borrows the whole library for the calling thread, and waits until the application's thread sleeps in
-/// `GrGetEvent`. May be nested, and is harmless on the application's thread. No thread may hold the library
-/// when it ends.
+/// `GrGetEvent`. May be nested, and is harmless on the application's thread. A thread that ends must have
+/// given the library back.
 GR_API void GrGrabInput();
 
 /// Gives the library back. With `unfreeze` the application's `GrGetEvent` returns false, so that its next

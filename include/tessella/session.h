@@ -8,6 +8,9 @@
 /// The calling thread becomes the application's thread: it holds the library from now on, and the functions
 /// below are for it alone unless they say otherwise. SIGUSR1 gets a handler that does nothing, and keeps it.
 ///
+/// The mouse device is opened, if there is one, and read on a thread of the library's own, which takes no
+/// signals. The pointer begins in the middle of the screen. All of the screen is due for paint.
+///
 /// `width`, `height` and `depth` are results only: they receive the size in pixels and the colour depth.
 /// `mode` is ignored.
 ///
@@ -17,14 +20,17 @@
 /// does nothing. Memory that cannot be mapped is told there too, but is no failure: nothing is painted then.
 GR_API bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode);
 
-/// Ends the session: clears the screen, unmaps and closes the framebuffer. Does nothing if there is no
-/// session. Called on the thread that started it. Contexts of the screen may still be deleted, and draw
-/// nothing; `GrScreen` keeps what it held, but for the context and the memory.
+/// Ends the session: clears the screen, ends the input threads, unmaps and closes the framebuffer. Does
+/// nothing if there is no session. The windows must have been destroyed before, and other threads have given
+/// the library back. Called on the thread that started it. Contexts of the screen may still be deleted, and
+/// draw nothing; `GrScreen` keeps what it held, but for the context and the memory.
 GR_API void GrDone();
 
-/// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it. Contexts of the screen,
-/// and images in the screen's format, that were made before must not be used any more. References and `mode`
-/// are as for `GrInit`.
+/// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it. All of the screen is due
+/// for paint then, the pointer goes to the middle, and no cursor is current. If the size is another one, the
+/// callback of windows gets `GrEventWindowChanged` for the root. Contexts of the screen, and images in the
+/// screen's format, that were made before must not be used any more. References and `mode` are as for
+/// `GrInit`.
 ///
 /// False on failure, with the references unchanged and the reason on the standard error stream. The session
 /// is then without a context, and nothing may be drawn, on images of the screen's format either, until a

@@ -62,18 +62,21 @@ public:
     /// The root: the whole screen below all windows. It belongs to the library, has no parent and is painted
     /// by the application like any other window.
     static GrWindow* RootWindow();
-    /// Sets the receiver of events, before the first window is made. It stays until the session ends.
+    /// Sets the receiver of events, before the first window is made. It stays until the session ends. When a
+    /// change of mode announces the root as changed, the screen is held: the receiver must not ask for input
+    /// or the pointer then.
     static void SetCallback(void (*callback)(GrEvent const&));
     /// The window that a point belongs to, counting shadows as parts of their windows if `withShadow`. The
-    /// root where there is no other, null off the screen.
+    /// root where there is no other, null off the screen. What sticks out of a parent is not found.
     static GrWindow* WindowAtXY(int x, int y, bool withShadow);
 
     /// Finds the next area that is due for paint and takes it for valid from now on, so the caller paints it.
     /// `event` becomes a paint event. With null, only tells whether anything is due. False if nothing is, or
     /// while the console shows somebody else's screen.
     static bool GetPaintEvent(GrEvent* event);
-    /// The same, looking only within `area` (screen coordinates), which becomes the area that the event's
-    /// rectangle encloses; with `event` null, all that is due there.
+    /// The same, looking only within `area` (screen coordinates), a part of the screen without gaps between
+    /// its rows. It becomes the area that the event's rectangle encloses; with `event` null, all that is due
+    /// there.
     static bool GetPaintEvent(GrEvent* event, GrRegion& area);
 
     /// A hidden window at the top of its parent's children. A negative width or height counts as 0. The
@@ -83,7 +86,7 @@ public:
     GrWindow(GrWindow const&) = delete;
     GrWindow& operator=(GrWindow const&) = delete;
     /// Tells the callback first (`GrEventWindowDestroyed`). There must be no children left; those that are
-    /// left must not be used any more.
+    /// left stand without a parent afterwards and can only be destroyed, or get another one.
     ~GrWindow();
 
     /// Links the window in as the topmost child of `parent`, without invalidating anything. It must not be
@@ -91,8 +94,9 @@ public:
     void InsertToParent();
     /// Takes the window out of its parent's list, without invalidating anything; `parent` stays set.
     void RemoveFromParent();
-    /// Makes the window the topmost child of `newParent`. Invalidates nothing and moves nothing: the caller
-    /// invalidates the window before and after.
+    /// Makes the window the topmost child of `newParent`, which must not be the window itself or below it.
+    /// Invalidates nothing and moves nothing: the caller invalidates the window before and, with `force`,
+    /// after. Not for the root.
     void SetParent(GrWindow* newParent);
 
     /// Puts the window on top of its siblings. What it gains is due for paint.
@@ -100,7 +104,8 @@ public:
     /// Puts the window below all its siblings. What it loses is due for paint by those that it uncovers.
     void Lower();
 
-    /// Makes the window visible, and tells the callback (`GrEventWindowShown`). Nothing if it is.
+    /// Makes the window visible and all of it due for paint, and tells the callback (`GrEventWindowShown`).
+    /// Nothing if it is.
     void Show();
     /// Makes the window invisible, and with it the whole subtree; tells the callback (`GrEventWindowHidden`).
     /// Nothing if it is invisible.
@@ -111,12 +116,12 @@ public:
     /// Moves the window and its subtree so that its corner is at `x`, `y` (screen coordinates), and tells the
     /// callback (`GrEventWindowChanged`). Old and new place are due for paint. Not for the root.
     void Move(int x, int y);
-    /// Moves the window and its subtree by an offset, without invalidating anything.
+    /// Moves the window and its subtree by an offset, without invalidating anything. Not for the root.
     void DoMove(int dx, int dy);
 
     /// Gives the window a shape, in window coordinates, and tells the callback (`GrEventWindowChanged`). A
-    /// shape that does not begin at 0, 0 moves the window's corner, and window coordinates with it. Nothing
-    /// on the root.
+    /// shape that does not begin at 0, 0 moves the window's corner, and window coordinates with it; an empty
+    /// one puts it to the screen's corner. Nothing on the root.
     void SetWindowRegion(GrRegion const& shape);
 
     /// Writes the pixels of this window that nothing covers into `out`. Of its children, those above `stop`
@@ -125,7 +130,8 @@ public:
     void DoGetClipRegion(GrRegion& out, GrWindow const* stop, bool fromValid, bool withShadow);
 
     /// A context with its origin at the window's corner, clipped to what is seen of the window now; later
-    /// changes of the tree do not reach it. Returned through `FreeContext`.
+    /// changes of the tree do not reach it. Returned through `FreeContext`. It draws in the mode that it was
+    /// made in, and must not be used in another. Null before the first session.
     GrContext* GetContext();
     /// The same, with the area of the children included. Returned through `FreeContext`.
     GrContext* GetNonclipContext();

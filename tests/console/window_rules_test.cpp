@@ -2,7 +2,6 @@
 #include <support/region_judge.h>
 #include <support/region_text.h>
 #include <tessella.h>
-#include <tessella/session_state.h>
 #include <tessella/window_state.h>
 
 #include <gtest/gtest.h>
@@ -59,6 +58,8 @@ TEST(Windows, MisuseIsReportedAndHarmless)
             lower.SetParent(nullptr);
             EXPECT_TRUE(!root.first && !root.last);
             lower.parent = &root;
+            root.SetParent(&upper);
+            EXPECT_FALSE(root.parent);
         }
         std::fputs("-- the root\n", stderr);
         root.Move(5, 5);
@@ -69,7 +70,7 @@ TEST(Windows, MisuseIsReportedAndHarmless)
         GrWindow child(parent, 0, 0, 9, 9, nullptr);
         std::fputs("-- children left\n", stderr);
         delete parent;
-        child.parent = &root;
+        EXPECT_EQ(child.parent, nullptr);
         std::fputs("-- the end\n", stderr);
         GrEvent event;
         GrRegion off = GrRect{100, 100, 101, 101};
@@ -81,10 +82,10 @@ TEST(Windows, MisuseIsReportedAndHarmless)
         "Screen->IsVisible(); Screen->IsVisible(); callback != 0; !Screen->IsVisible(); "
         "\nno parent, no callback: p != 0; Callback != 0; parent!=0; parent != 0; parent != 0; parent != 0; "
         "parent != 0; Callback != 0; parent!=0; "
-        "\nlinked in twice: next==0; prev==0; nparent!=0; parent!=0; "
+        "\nlinked in twice: next==0; prev==0; nparent!=0; parent!=0; parent!=0; "
         "\nthe root: parent != 0; parent != 0; "
         "\nchildren left: first == 0; last == 0; "
-        "\nthe end: window != 0; reg; Callback != 0; ");
+        "\nthe end: window != 0; reg; Callback != 0; parent!=0; ");
 }
 
 /// A shape of rectangles thrown anywhere, mostly with gaps between its rows.

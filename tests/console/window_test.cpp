@@ -36,8 +36,13 @@ int Number(GrWindow const* window)
     return static_cast<int>(reinterpret_cast<std::intptr_t>(window->userData));
 }
 
+class Soak;
+Soak* painter = nullptr;  // who wants paint through the callback
+void PaintNow(GrEvent const& event);
+
 void OnEvent(GrEvent const& event)
 {
+    if (event.type == GrEventPaint) return PaintNow(event);
     bool const hasRect = event.type == GrEventWindowCreated || event.type == GrEventWindowChanged;
     events += Text(event.type, Number(event.window), hasRect ? event.rect : GrRect{});
 }
@@ -66,6 +71,20 @@ public:
         }
         while (!windows.empty())
             Destroy(windows.begin()->first);
+        Check();
+    }
+
+    /// Paints as an application does, what the judge says is next.
+    void PaintAsTold(GrEvent const& event)
+    {
+        WindowJudge::Paint paint{};
+        EXPECT_TRUE(judge.NextPaint(paint));
+        EXPECT_EQ(
+            Text(event.type, Number(event.window), event.rect), Text(GrEventPaint, paint.window, paint.rect));
+        GrContext* const context = event.window->GetContext();
+        context->SetForeColor(paint.color);
+        context->FillRegion(event.rect);
+        event.window->FreeContext(context);
     }
 
 private:
@@ -206,20 +225,13 @@ private:
     /// Takes one paint event, through the pump, and paints as an application does.
     bool TakePaint()
     {
-        bool const due = GrHasEvent();
-        GrEvent event;
-        WindowJudge::Paint paint{};
-        if (!judge.NextPaint(paint)) {
-            EXPECT_FALSE(GrWindow::GetPaintEvent(nullptr));
+        if (!GrWindow::GetPaintEvent(nullptr)) {
+            EXPECT_EQ(std::count(judge.valid.begin(), judge.valid.end(), false), 0);
             return false;
         }
-        EXPECT_TRUE(due && GrGetEvent(event, &noWait));
-        EXPECT_EQ(
-            Text(event.type, Number(event.window), event.rect), Text(GrEventPaint, paint.window, paint.rect));
-        GrContext* const context = event.window->GetContext();
-        context->SetForeColor(paint.color);
-        context->FillRegion(event.rect);
-        event.window->FreeContext(context);
+        GrEvent event;
+        EXPECT_TRUE(GrHasEvent() && GrGetEvent(event, &noWait));
+        PaintAsTold(event);
         return true;
     }
 
@@ -228,6 +240,12 @@ private:
         EXPECT_EQ(events, wanted);
         events.clear(), wanted.clear();
         CheckValidAndFlags();
+        if (Pick(2) == 0) {
+            painter = this;
+            GrWindow::RootWindow()->Repaint({});  // all that is due, whatever is asked for
+            painter = nullptr;
+            EXPECT_FALSE(GrWindow::GetPaintEvent(nullptr));
+        }
         while (TakePaint() && !testing::Test::HasFailure()) {
         }
         CheckValidAndFlags();
@@ -275,6 +293,8 @@ private:
     std::string wanted;
     int pointerX = kWidth / 2, pointerY = kHeight / 2;
 };
+
+void PaintNow(GrEvent const& event) { painter->PaintAsTold(event); }
 
 TEST(Windows, RandomTreesAreAsTheJudgeSays)
 {

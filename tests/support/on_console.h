@@ -19,13 +19,14 @@ inline bool Init(Sizes& sizes) { return GrInit(sizes.width, sizes.height, sizes.
 template <typename Body>
 ChildOutcome OnConsole(char const* mode, char const* format, Body body)
 {
+    bool const failedBefore = testing::Test::HasFailure();
     ChildOutcome outcome = RunChild([&] {
         console::Setup setup{*console::ParseMode(mode), {}, {}};
         if (format) setup.format = console::ParseFormat(format);
         console::VirtualConsole screen(setup);
         screen.AttachProcess();
         body(screen);
-        return testing::Test::HasFailure() ? 1 : 0;
+        return testing::Test::HasFailure() && !failedBefore ? 1 : 0;
     });
     EXPECT_EQ(outcome.status, 0) << outcome.out << outcome.err;
     return outcome;

@@ -75,6 +75,29 @@ public:
     /// Paints a region through pattern and raster mode.
     virtual void FillRegion(GrRegion const& region) = 0;
 
+    /// Paints a line between two points, both included, through pattern and raster mode. It is always drawn
+    /// from its upper end, so the two may change places.
+    virtual void DrawLine(int x1, int y1, int x2, int y2) = 0;
+
+    /// Paints the outline of an ellipse, or an arc of it, through pattern and raster mode. The ellipse
+    /// touches the columns `x` and `x` + `w` and the rows `y` and `y` + `h`; below 0, `w` or `h` paints
+    /// nothing. Angles are in 64ths of a degree, 0 at 3 o'clock and growing anticlockwise: the arc begins at
+    /// `start` and covers `sweep`, clockwise if negative, from 23040 on the whole ellipse. An arc that lies
+    /// within one quadrant reaches back along the ellipse to where the quadrant begins, at its smaller angle;
+    /// one column or two, `w` 0 or 1, have their middle row or two rows painted only.
+    virtual void DrawArc(int x, int y, int w, int h, int start, int sweep) = 0;
+    /// Paints what lies inside the outline that `DrawArc` paints with the same arguments: an ellipse or a pie,
+    /// with its tip at the centre, no pixel twice except that the two cut edges of a pie may meet in some.
+    /// Nothing with `w` or `h` below 2. Of ellipses many times as high as wide the outermost rows may stay
+    /// unpainted.
+    virtual void FillArc(int x, int y, int w, int h, int start, int sweep) = 0;
+
+    /// Paints a polygon of `count` vertices, at least 3, through pattern and raster mode; `xy` holds the x and
+    /// the y of each. It is meant for polygons that a horizontal line cuts at most twice: each row is painted
+    /// from one side's edge to the other's, the right one and the lowest row excluded, so that polygons with
+    /// common edges share no pixel.
+    virtual void FillPolygon(std::int16_t const xy[], unsigned count) = 0;
+
     /// Does nothing, unless the context can copy from another: then it fills the rectangle `dst` from
     /// `source`, whose point `sx`, `sy`, in its own context coordinates, goes to the top left corner.
     virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);

@@ -113,14 +113,15 @@ std::size_t Slot(Pointer function)
 TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
 {
     std::size_t slot = 2;  // behind the two entries of the destructor
-    for (std::size_t const actual :
-        {Slot(&GrContext::SetClipRegion), Slot(&GrContext::GetClipRegion), Slot(&GrContext::ExcludeClipRect),
-            Slot(&GrContext::ExcludeClipRegion), Slot(&GrContext::ResetClipRegion),
-            Slot(&GrContext::GetClipRect), Slot(&GrContext::SetOrigin), Slot(&GrContext::GetOrigin),
-            Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor), Slot(&GrContext::SetPattern),
-            Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode), Slot(&GrContext::GetPixel),
-            Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion), Slot(&GrContext::CopyFromContext),
-            Slot(&GrContextI::SetBaseOrigin), Slot(&GrContextI::SetLimitRegion)})
+    for (std::size_t const actual : {Slot(&GrContext::SetClipRegion), Slot(&GrContext::GetClipRegion),
+             Slot(&GrContext::ExcludeClipRect), Slot(&GrContext::ExcludeClipRegion),
+             Slot(&GrContext::ResetClipRegion), Slot(&GrContext::GetClipRect), Slot(&GrContext::SetOrigin),
+             Slot(&GrContext::GetOrigin), Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor),
+             Slot(&GrContext::SetPattern), Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode),
+             Slot(&GrContext::GetPixel), Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion),
+             Slot(&GrContext::DrawLine), Slot(&GrContext::DrawArc), Slot(&GrContext::FillArc),
+             Slot(&GrContext::FillPolygon), Slot(&GrContext::CopyFromContext),
+             Slot(&GrContextI::SetBaseOrigin), Slot(&GrContextI::SetLimitRegion)})
         EXPECT_EQ(actual, slot++);
 }
 
@@ -138,6 +139,11 @@ TEST(ContextState, CoordinatesBeyondTheirRangeAreClippedAway)
         EXPECT_EQ(context->GetPixel(-origin, -origin), static_cast<GrColor>(100 + origin));
         context->DrawPixel(kMax, kMin);
         EXPECT_EQ(context->GetPixel(kMin, kMax), 0u);
+        context->SetForeColor(static_cast<GrColor>(200 + origin));
+        context->DrawLine(kMax, kMax, kMin, kMin);
+        EXPECT_EQ(context->GetPixel(1 - origin, 1 - origin), static_cast<GrColor>(200 + origin));
+        context->DrawArc(kMax - 2, kMax - 2, 5, 5, kMin, kMin);
+        context->FillArc(kMin, 0, kMax, 2, kMax, 100);
         context->ExcludeClipRect({kMin, kMin, kMax, kMax});
         EXPECT_EQ(ClipRect(*context), (GrRect{-origin, -origin, -origin, -origin}));
     }
@@ -234,6 +240,12 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
                                },
                               true},
              Case{[&] { context->FillRegion(GrRegion()); }, true},
+             Case{[&] { context->DrawLine(1, 1, 1, 5); }, true},
+             Case{[&] { context->DrawLine(16, 1, 20, 5); }, false},
+             Case{[&] { context->DrawArc(1, 1, 5, 5, 0, 1); }, true},
+             Case{[&] { context->DrawArc(9, 9, 20, 20, 0, 5760); }, false},
+             Case{[&] { context->FillArc(9, 9, 20, 20, 5760, 5760); }, true},
+             Case{[&] { context->FillArc(0, -8, 20, 20, 5760, 2000); }, true},
              Case{[&] { context->DrawPixel(1, 1); }, true}, Case{[&] { context->GetPixel(1, 1); }, true},
              Case{[&] { context->DrawPixel(16, 1); }, false},
              Case{[&] { context->GetPixel(1, -1); }, false}}) {

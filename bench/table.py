@@ -10,7 +10,7 @@ import subprocess
 import sys
 
 OURS = "tessella"
-GROUPS = ["rectangles", "regions", "cuts", "windows", "fills"]
+GROUPS = ["rectangles", "regions", "cuts", "windows", "fills", "figures"]
 
 # These merge with lists of bands that the library reports as damaged, each time with the call stack. They run
 # with the reports off, which leaves the work itself, and on; all other rows report nothing and run with
@@ -36,6 +36,12 @@ GOALS = [(re.compile(row), least, aim) for row, least, aim in [
     (r"solid fill 1024x768, (16|24|32) bits", 0.9, 1.0),
     (r"solid fill 300x200, ", 0.8, 0.9),
     (r"FillRegion 16x16, .*clip of 1 range,", 0.8, 1.1),
+    (r"64 lines, horizontal, ", 1.0, 1.3),
+    (r"64 lines, vertical, ", 0.95, 1.0),
+    (r"64 lines, 45 degrees, ", 0.8, 1.0),
+    (r"64 lines, random, ", 0.7, 0.95),
+    (r"64 filled ellipses \d+x\d+, \d+ bits", 1.5, 5),
+    (r"64 outlined ellipses \d+x\d+, \d+ bits", 10, 30),
 ]]
 
 # One union into 10,000 rectangles may cost this much more than one into 1,000.

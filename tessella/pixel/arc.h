@@ -5,37 +5,16 @@
 
 #include <cstdint>
 
-/// An elliptical arc in the making. No angle is tested while drawing: the arc becomes a region, a union of
-/// boxes, which holds the arc's part of the ellipse and not the rest of it. Each box is a quarter of the
-/// ellipse's bounding box; the first and the last one are trimmed where the arc ends.
-///
-///     +------+------+
-///     |  _.--|      |      The arc from 3 o'clock to E: the upper right quarter, and what lies right of
-///     | E....|      |      E and above it in the upper left one. Of the pie, the triangle E, below E,
-///     |  \   |      |      centre is missing: a wedge.
-///     +------+------+
-///
-/// The ellipse itself is walked from its middle row, or middle two rows, up and down at once.
-struct GrArcState {
-    /// The part of a pie that no box holds, between two straight segments that run downward: A on the left,
-    /// B on the right, ends included.
-    struct Wedge {
-        struct Segment {
-            int x0, y0, x1, y1;
-        };
-        Segment a, b;
-    };
-
+/// Follows an ellipse from its middle row, or middle two rows, up and down at once. Walked as a copy of one's
+/// own, it stays in registers: nothing that is stored to pixels can reach it.
+struct GrEllipseWalk {
     int left = 0, upperRow = 0, right = 0, lowerRow = 0;
     unsigned char* upperAddress = nullptr;
     unsigned char* lowerAddress = nullptr;
-    LocalRegion region;  ///< where the arc may appear, within the clip
-    Wedge wedges[2]{};
-    int wedgeCount = 0;
     std::uint32_t stride = 0;
     int topRow = 0;
     std::int64_t stepY = 0, stepX = 0, spanTerm = 0, rowTerm = 0;
-    std::int64_t decision = 0;  ///< negative while the row's columns have to move inward
+    std::int64_t decision = 0;  ///< negative while the rows' columns have to move inward
 
     void MoveColumns()
     {
@@ -66,6 +45,30 @@ private:
         term =
             static_cast<std::int64_t>(static_cast<std::uint64_t>(term) - static_cast<std::uint64_t>(amount));
     }
+};
+
+/// An elliptical arc in the making. No angle is tested while drawing: the arc becomes a region, a union of
+/// boxes, which holds the arc's part of the ellipse and not the rest of it. Each box is a quarter of the
+/// ellipse's bounding box; the first and the last one are trimmed where the arc ends.
+///
+///     +------+------+
+///     |  _.--|      |      The arc from 3 o'clock to E: the upper right quarter, and what lies right of
+///     | E....|      |      E and above it in the upper left one. Of the pie, the triangle E, below E,
+///     |  \   |      |      centre is missing: a wedge.
+///     +------+------+
+struct GrArcState : GrEllipseWalk {
+    /// The part of a pie that no box holds, between two straight segments that run downward: A on the left,
+    /// B on the right, ends included.
+    struct Wedge {
+        struct Segment {
+            int x0, y0, x1, y1;
+        };
+        Segment a, b;
+    };
+
+    LocalRegion region;  ///< where the arc may appear, within the clip
+    Wedge wedges[2]{};
+    int wedgeCount = 0;
 };
 
 /// Sets up the arc in the box of `w` by `h` pixels at `x`, `y`, in surface coordinates, from angle `start` on

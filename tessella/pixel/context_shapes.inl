@@ -128,26 +128,40 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     GrRegion const& region = arc.region.Get();
     if (!region) return;
     typename S::Guard const guard(region);
-    Coverage const quadrants[] = {CoverageOf(QuadrantBox(0, x, y, w, h), region),
-        CoverageOf(QuadrantBox(1, x, y, w, h), region), CoverageOf(QuadrantBox(2, x, y, w, h), region),
-        CoverageOf(QuadrantBox(3, x, y, w, h), region)};
-    auto const paint = [&](int quadrant, unsigned char* row, int column, int line) {
+    Coverage quadrants[4];
+    for (int q = 0; q < 4; ++q)
+        quadrants[q] = CoverageOf(QuadrantBox(q, x, y, w, h), region);
+    auto const isWhole = [](Coverage coverage) { return coverage == Coverage::All; };
+    if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) {
+        WalkOutline(arc, [this, pixel = this->foreColor](int, unsigned char* row, int column, int) {
+            this->WritePixel(row, column, pixel);
+        });
+        return;
+    }
+    WalkOutline(arc, [&](int quadrant, unsigned char* row, int column, int line) {
         Coverage const coverage = quadrants[quadrant];
         if (coverage == Coverage::All || (coverage == Coverage::Part && region.Contains(column, line)))
             this->PatternPixel(
                 row, column, this->pattern[line & 7], this->patternTransparent, this->rasterMode);
-    };
-    while (arc.upperRow >= arc.topRow) {
-        paint(0, arc.upperAddress, arc.right, arc.upperRow);
-        if (arc.left != arc.right) paint(1, arc.upperAddress, arc.left, arc.upperRow);
-        if (arc.upperRow != arc.lowerRow) {
-            paint(2, arc.lowerAddress, arc.left, arc.lowerRow);
-            if (arc.left == arc.right) return;
-            paint(3, arc.lowerAddress, arc.right, arc.lowerRow);
+    });
+}
+
+/// Has the points of the ellipse painted, each with the quadrant that it lies in.
+template <typename S>
+template <typename Paint>
+void GrGenericContextBase<S>::WalkOutline(GrEllipseWalk walk, Paint paint)
+{
+    while (walk.upperRow >= walk.topRow) {
+        paint(0, walk.upperAddress, walk.right, walk.upperRow);
+        if (walk.left != walk.right) paint(1, walk.upperAddress, walk.left, walk.upperRow);
+        if (walk.upperRow != walk.lowerRow) {
+            paint(2, walk.lowerAddress, walk.left, walk.lowerRow);
+            if (walk.left == walk.right) return;
+            paint(3, walk.lowerAddress, walk.right, walk.lowerRow);
         }
-        if (arc.right - arc.left < 2) return;
-        if (arc.decision < 0) arc.MoveColumns();
-        if (arc.decision >= 0) arc.MoveRows();
+        if (walk.right - walk.left < 2) return;
+        if (walk.decision < 0) walk.MoveColumns();
+        if (walk.decision >= 0) walk.MoveRows();
     }
 }
 
@@ -159,27 +173,28 @@ void GrGenericContextBase<S>::FillArc(int x, int y, int w, int h, int start, int
     ArcSetup(arc, Moved(Moved(x, this->originX), 1), Moved(Moved(y, this->originY), 1), Moved(w, -1),
         Moved(h, -1), start, sweep, this->PixelBase(), static_cast<std::uint32_t>(this->Stride()),
         this->clip);
-    if (arc.region.Get()) FillEllipse(arc);
+    if (arc.region.Get()) {
+        typename S::Guard const guard(arc.region.Get());
+        FillEllipse(arc, arc.region.Get());
+    }
     if (arc.wedgeCount != 0) FillWedges(arc);
 }
 
 template <typename S>
-void GrGenericContextBase<S>::FillEllipse(GrArcState& arc) const
+void GrGenericContextBase<S>::FillEllipse(GrEllipseWalk walk, GrRegion const& region) const
 {
-    GrRegion const& region = arc.region.Get();
-    typename S::Guard const guard(region);
     for (;;) {
-        FillScan(arc.upperAddress, region, {arc.left, arc.upperRow, Moved(arc.right, 1), arc.upperRow + 1});
-        if (arc.lowerRow != arc.upperRow)
-            FillScan(
-                arc.lowerAddress, region, {arc.left, arc.lowerRow, Moved(arc.right, 1), arc.lowerRow + 1});
-        if (arc.upperRow <= arc.topRow) return;
-        while (arc.decision < 0) {
-            arc.MoveColumns();
-            // Tall boxes of two columns and their like come to an end here, short of their top.
-            if (arc.left > arc.right) return;
+        int const right = Moved(walk.right, 1);
+        FillScan(walk.upperAddress, region, {walk.left, walk.upperRow, right, walk.upperRow + 1});
+        if (walk.lowerRow != walk.upperRow)
+            FillScan(walk.lowerAddress, region, {walk.left, walk.lowerRow, right, walk.lowerRow + 1});
+        if (walk.upperRow <= walk.topRow) return;
+        while (walk.decision < 0) {
+            walk.MoveColumns();
+            // Tall ellipses of an even width come to an end here, short of their top.
+            if (walk.left > walk.right) return;
         }
-        arc.MoveRows();
+        walk.MoveRows();
     }
 }
 

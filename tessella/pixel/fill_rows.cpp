@@ -1,6 +1,8 @@
 #include <tessella/pixel/fill_rows.h>
 
+#include <algorithm>
 #include <cstring>
+#include <iterator>
 
 // Sanitizers would instrument the choice of the version too, which happens before they are ready; and clang
 // does not know the names of these processors.
@@ -37,8 +39,9 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
     int height = rows.height;
 
     auto const position = reinterpret_cast<std::uintptr_t>(row) | static_cast<std::uintptr_t>(stride);
+    bool const equal = bytesPerPixel != 3;  // then a power of 2
     bool const linesUp =
-        length >= 256 && bytesPerPixel != 3 && position % static_cast<unsigned>(bytesPerPixel) == 0;
+        length >= 256 && equal && (position & (static_cast<unsigned>(bytesPerPixel) - 1)) == 0;
 
     auto const fill = [&]<typename Vector>(Vector const& first, Vector const& second, Vector const& third) {
         constexpr std::ptrdiff_t kSize = sizeof(Vector);
@@ -66,10 +69,21 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
         }
     };
 
-    if (length >= std::ptrdiff_t{sizeof(Block)}) {
+    // Equal words fill a block at once; laying out three different ones would cost a short row more than
+    // storing them.
+    if (length >= std::ptrdiff_t{sizeof(Block)} && equal) {
+        std::uint32_t same[sizeof(Block) / sizeof a];
+        std::fill(std::begin(same), std::end(same), a);
+        Block block;
+        std::memcpy(&block, same, sizeof block);
+        fill(block, block, block);
+    } else if (length >= std::ptrdiff_t{sizeof(Block)}) {
         fill(Block{a, b, c, a, b, c, a, b, c, a, b, c, a, b, c, a},
             Block{b, c, a, b, c, a, b, c, a, b, c, a, b, c, a, b},
             Block{c, a, b, c, a, b, c, a, b, c, a, b, c, a, b, c});
+    } else if (length >= std::ptrdiff_t{sizeof(SmallBlock)} && equal) {
+        SmallBlock const block = SmallBlock{} + a;
+        fill(block, block, block);
     } else if (length >= std::ptrdiff_t{sizeof(SmallBlock)}) {
         fill(SmallBlock{a, b, c, a}, SmallBlock{b, c, a, b}, SmallBlock{c, a, b, c});
     } else {

@@ -31,7 +31,9 @@ protected:
 private:
     void DrawColumn(GrRegion const& region, int x) const;
     void DrawRun(GrLineWalker line, std::uint64_t count) const;
-    void FillEllipse(GrArcState& arc) const;
+    template <typename Paint>
+    static void WalkOutline(GrEllipseWalk walk, Paint paint);
+    void FillEllipse(GrEllipseWalk walk, GrRegion const& region) const;
     void FillWedges(GrArcState const& arc) const;
 
     /// Paints the pixels of `line`, a rectangle one row high, that belong to `region`; `row` is where its row

@@ -14,17 +14,17 @@
 #include <numbers>
 #include <vector>
 
-// Lines and ellipses in one colour, on images as wide as the screen or 16 pixels wider: a pitch of 4,096 bytes
-// sends all rows of a column to one cache set. SDL's lines are those of its software renderer. Neither peer has
-// ellipses. Their users draw polygons of 64 corners; or, in rows of their own, they find out themselves which
-// rows or points to paint, as fast as can be, and have them painted in one call an ellipse.
+// Lines and ellipses in one colour, on images as wide as the screen or 16 pixels wider: a pitch of 4,096
+// bytes sends all rows of a column to one cache set. SDL's lines are those of its software renderer. Neither
+// peer has ellipses. Their users draw polygons of 64 corners; or, in rows of their own, they find out
+// themselves which rows or points to paint, as fast as can be, and have them painted in one call an ellipse.
 
 namespace {
 
 using SharedSurface = std::shared_ptr<Surface const>;
 
-/// What is drawn in one pass: a line from `x1`, `y1` to `x2`, `y2`, both painted, or an ellipse that fills the
-/// rectangle.
+/// What is drawn in one pass: a line from `x1`, `y1` to `x2`, `y2`, both painted, or an ellipse that fills
+/// the rectangle.
 using Places = std::vector<GrRect>;
 
 using DrawAll = std::function<void(Places const&)>;
@@ -84,8 +84,8 @@ DrawAll OutlinedOurs(Surface const& surface)
     };
 }
 
-/// Walks along a quarter of the ellipse, from its middle row outward: `visit` gets how far from the sides, and
-/// from the middle row or rows, each of its points is, until it returns false.
+/// Walks along a quarter of the ellipse, from its middle row outward: `visit` gets how far from the sides,
+/// and from the middle row or rows, each of its points is, until it returns false.
 template <typename Visit>
 void WalkEllipse(std::int64_t w, std::int64_t h, Visit visit)
 {

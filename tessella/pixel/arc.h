@@ -77,8 +77,8 @@ struct GrArcState : GrEllipseWalk {
 void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep, unsigned char* base,
     std::uint32_t stride, GrRegion const& clip);
 
-/// A quarter of the box of `w` by `h` pixels at `x`, `y`: from 0 on upper right, upper left, lower left, lower
-/// right, and round again. A middle row or column belongs to both of its sides.
+/// A quarter of the box of `w` by `h` pixels at `x`, `y`: from 0 on upper right, upper left, lower left,
+/// lower right, and round again. A middle row or column belongs to both of its sides.
 GrRect QuadrantBox(int q, int x, int y, int w, int h);
 
 /// Gives a wedge as lines, from top to bottom. Where only one of its segments is, the end of the other one

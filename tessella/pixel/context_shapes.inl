@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <utility>
 
 template <typename S>
 void GrGenericContextBase<S>::FillScan(unsigned char* row, GrRegion const& region, GrRect const& line) const

@@ -69,8 +69,8 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
         }
     };
 
-    // Equal words fill a block at once; laying out three different ones would cost a short row more than
-    // storing them.
+    // Laying out three blocks costs a short row more than storing them, so equal words make one only; and
+    // from an array, since the compiler would set the words of a large vector one by one.
     if (length >= std::ptrdiff_t{sizeof(Block)} && equal) {
         std::uint32_t same[sizeof(Block) / sizeof a];
         std::fill(std::begin(same), std::end(same), a);

@@ -40,9 +40,8 @@ protected:
     /// Writes `count` pixels, each `step` bytes behind the one before.
     static void StepPixels(unsigned char* address, std::ptrdiff_t step, std::uint64_t count, Pixel pixel)
     {
-        for (; count > 1; --count, address += step)
+        for (; count > 0; --count, address += step)
             WritePixel(address, 0, pixel);
-        if (count != 0) WritePixel(address, 0, pixel);
     }
 
     void PatternPixel(

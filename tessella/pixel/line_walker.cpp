@@ -14,10 +14,11 @@ constexpr int kMax = std::numeric_limits<int>::max();
 
 /// The coordinates around one that are all in the same item of a list, or all in the same gap.
 template <typename Item>
-struct Stretch : GrRange {
-    Item const* item;  ///< null in a gap
+struct Stretch {
+    int r1 = kMin, r2 = kMax;
+    Item const* item = nullptr;  ///< null in a gap
 
-    Stretch(std::span<Item const> list, int v) : GrRange{kMin, kMax}, item(nullptr)
+    Stretch(std::span<Item const> list, int v)
     {
         auto const next = std::ranges::upper_bound(list, v, {}, &Item::r1);
         if (next != list.end()) r2 = next->r1;

@@ -5,12 +5,12 @@
 
 #include <cstdint>
 
-/// Follows two chains of a polygon's edges downward from its top vertex, A to lower indices, B to higher ones,
-/// and gives what lies between them, a line in each row.
+/// Follows two chains of a polygon's edges downward from its top vertex, A to lower indices, B to higher
+/// ones, and gives what lies between them, a line in each row.
 class GrPolygonWalker {
 public:
-    /// The polygon has at least one vertex; `xy` holds the x and the y of each, to be moved by the origin, and
-    /// must outlive the walker.
+    /// The polygon has at least one vertex; `xy` holds the x and the y of each, to be moved by the origin,
+    /// and must outlive the walker.
     GrPolygonWalker(std::int16_t const xy[], unsigned count, int originX, int originY);
 
     /// Around all vertices, the largest coordinates excluded.

@@ -9,8 +9,8 @@
 #include <utility>
 #include <vector>
 
-/// The judge of shapes: each is handed to `paint` pixel by pixel, unclipped. Edges and angles are divided out
-/// for every row, and regions are tests of single pixels.
+/// The judge of shapes: each is handed to `paint` pixel by pixel, unclipped. Edges are divided out for every
+/// row, and regions are tests of single pixels.
 namespace model {
 
 using Paint = std::function<void(int x, int y)>;
@@ -20,8 +20,7 @@ struct Edge {
     int x1, y1, x2, y2;
     int X(int y) const
     {
-        if (y1 == y2) return x1;
-        double const exact = static_cast<double>(y - y1) * (x2 - x1) / (y2 - y1);
+        double const exact = static_cast<double>(y - y1) * (x2 - x1) / std::max(y2 - y1, 1);
         return x1 + static_cast<int>(std::ceil(exact));
     }
 };
@@ -29,16 +28,9 @@ struct Edge {
 inline void Line(Paint const& paint, int x1, int y1, int x2, int y2)
 {
     if (y1 > y2) std::swap(x1, x2), std::swap(y1, y2);
-    int const dx = std::abs(x2 - x1) + 1, dy = y2 - y1 + 1, direction = x1 <= x2 ? 1 : -1;
-    bool const alongX = dx >= dy;
-    for (int x = x1, y = y1, error = 0, n = std::max(dx, dy); n > 0; --n) {
-        paint(x, y);
-        (alongX ? x : y) += alongX ? direction : 1;
-        error += alongX ? dy : dx;
-        if (error < std::max(dx, dy)) continue;
-        error -= std::max(dx, dy);
-        (alongX ? y : x) += alongX ? 1 : direction;
-    }
+    int const dx = std::abs(x2 - x1) + 1, dy = y2 - y1 + 1, n = std::max(dx, dy);
+    for (int i = 0; i < n; ++i)
+        paint(x1 + (x1 <= x2 ? 1 : -1) * (i * dx / n), y1 + i * dy / n);
 }
 
 inline void Polygon(Paint const& paint, std::vector<std::int16_t> const& xy)
@@ -145,14 +137,12 @@ inline void DrawEllipse(Paint const& paint, Arc const& arc, Kind kind)
         if (outline ? right - left < 2 : upper <= arc.y) return;
         while (decision < 0 && left <= right) {
             decision += span -= 2 * h * h;
-            ++left;
-            --right;
+            ++left, --right;
             if (outline) break;
         }
         if (left > right) return;
         if (decision < 0) continue;
-        --upper;
-        ++lower;
+        --upper, ++lower;
         decision -= row += 2 * w * w;
     }
 }

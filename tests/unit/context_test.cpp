@@ -80,26 +80,24 @@ private:
 
     void DrawShape()
     {
-        auto const paint = [this](int x, int y) { canvas.DrawPixel(x, y); };
-        int const x = Number(-30, kWidth), y = Number(-30, kHeight), kind = Number(0, 3);
-        int const w = Number(-2, 60), h = Number(-2, 40);
+        auto const paint = [this](int px, int py) { canvas.DrawPixel(px, py); };
+        int const x = Number(-30, kWidth), y = Number(-30, kHeight), w = Number(-2, 60), h = Number(-2, 40);
+        int const x2 = Number(0, 4) ? Number(-30, kWidth + 30) : x, y2 = Number(0, 4) ? y + h : y;
         int const start = Angle(), sweep = Angle();
-        if (kind == 0) {
-            int const x2 = Number(0, 4) ? Number(-30, kWidth + 30) : x, y2 = Number(0, 4) ? y + h : y;
-            context.DrawLine(x, y, x2, y2);
-            model::Line(paint, x, y, x2, y2);
-        } else if (kind == 1) {
-            std::vector<std::int16_t> xy(static_cast<std::size_t>(2 * Number(2, 7)));
-            for (auto& coordinate : xy)
-                coordinate = static_cast<std::int16_t>(Number(-20, kWidth));
+        std::vector<std::int16_t> xy(static_cast<std::size_t>(2 * Number(2, 7)));
+        for (auto& coordinate : xy)
+            coordinate = static_cast<std::int16_t>(Number(-20, kWidth));
+        switch (Number(0, 3)) {
+        case 0: context.DrawLine(x, y, x2, y2), model::Line(paint, x, y, x2, y2); break;
+        case 1:
             context.FillPolygon(xy.data(), static_cast<unsigned>(xy.size() / 2));
             model::Polygon(paint, xy);
-        } else if (kind == 2) {
+            break;
+        case 2:
             context.DrawArc(x, y, w, h, start, sweep);
             model::DrawArc(paint, x, y, w, h, start, sweep);
-        } else {
-            context.FillArc(x, y, w, h, start, sweep);
-            model::FillArc(paint, x, y, w, h, start, sweep);
+            break;
+        default: context.FillArc(x, y, w, h, start, sweep); model::FillArc(paint, x, y, w, h, start, sweep);
         }
     }
     int Angle() { return Number(0, 2) ? Number(-40000, 40000) : Number(-9, 9) * 2880; }

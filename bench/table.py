@@ -11,7 +11,7 @@ import sys
 
 OURS = "tessella"
 CLOCK = "/process_time"  # how Google Benchmark marks the clock that main.cpp asks for
-GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills", "blits"]
+GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills", "blits", "figures"]
 
 # These merge with lists of bands that the library reports as damaged, each time with the call stack. They run
 # with the reports off, which leaves the work itself, and on; all other rows report nothing and run with
@@ -50,6 +50,12 @@ GOALS = [(re.compile(row), least, aim) for row, least, aim in [
     (r"diffuse 300x200, opaque, 16 bits", 6, 10),
     (r"diffuse 300x200, over, 16 bits", 5, 6),
     (r"diffuse 300x200, opaque, 8 bits", 4, 6),
+    (r"64 lines, horizontal, ", 1.0, 1.3),
+    (r"64 lines, vertical, ", 0.95, 1.0),
+    (r"64 lines, 45 degrees, ", 0.8, 1.0),
+    (r"64 lines, random, ", 0.7, 0.95),
+    (r"64 filled ellipses \d+x\d+, \d+ bits", 1.5, 5),
+    (r"64 outlined ellipses \d+x\d+, \d+ bits", 10, 30),
 ]]
 
 # One union into 10,000 rectangles may cost this much more than one into 1,000.

@@ -90,6 +90,29 @@ public:
     /// alpha everywhere, 0 transparent to 255 opaque. Formats of at most 16 bits diffuse errors.
     virtual void FillRegionAlpha(GrRegion const& region, std::uint8_t alpha) = 0;
 
+    /// Paints a line between two points, both included, through pattern and raster mode. It is always drawn
+    /// from its upper end, so the two may change places.
+    virtual void DrawLine(int x1, int y1, int x2, int y2) = 0;
+
+    /// Paints the outline of an ellipse, or an arc of it, through pattern and raster mode. The ellipse
+    /// reaches from column `x` to `x` + `w` and from row `y` to `y` + `h`, ends included; if one is below 0,
+    /// nothing is painted. Angles are in 64ths of a degree, 0 at 3 o'clock and growing anticlockwise: the arc
+    /// begins at `start` and covers `sweep`, clockwise if that is negative; 23040 or more either way is the
+    /// whole ellipse. An arc that lies within one quadrant reaches back along the ellipse to where the
+    /// quadrant begins, at its smallest angle. With `w` 0 or 1, only the middle row or two rows are painted.
+    virtual void DrawArc(int x, int y, int w, int h, int start, int sweep) = 0;
+    /// Paints what lies inside the outline that `DrawArc` paints with the same arguments: an ellipse or a
+    /// pie, with its tip at the centre, no pixel twice except that the two cut edges of a pie may meet in
+    /// some. With `w` or `h` below 2, nothing is painted. Of very tall ellipses the rows at both ends may
+    /// stay unpainted.
+    virtual void FillArc(int x, int y, int w, int h, int start, int sweep) = 0;
+
+    /// Paints a polygon through pattern and raster mode. `xy` holds the x and the y of each of its `count`
+    /// vertices; fewer than 3 paint nothing. It is meant for polygons that a horizontal line cuts at most
+    /// twice: each row is painted from the edges on one side to those on the other, the rightmost column and
+    /// the lowest row excluded, so that polygons with common edges share no pixel.
+    virtual void FillPolygon(std::int16_t const xy[], unsigned count) = 0;
+
     /// Paints the set pixels of a bitmap in the fore colour and the clear ones in the back colour, with its
     /// top left corner at `x`, `y`. Pattern and raster mode are not looked at.
     virtual void DrawBitmap(int x, int y, GrBitmap const& bitmap) = 0;

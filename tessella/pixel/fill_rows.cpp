@@ -2,7 +2,9 @@
 
 #include <tessella/pixel/clones.h>
 
+#include <algorithm>
 #include <cstring>
+#include <iterator>
 
 namespace {
 
@@ -30,8 +32,9 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
     int height = rows.height;
 
     auto const position = reinterpret_cast<std::uintptr_t>(row) | static_cast<std::uintptr_t>(stride);
+    bool const equal = bytesPerPixel != 3;  // then a power of 2
     bool const linesUp =
-        length >= 256 && bytesPerPixel != 3 && position % static_cast<unsigned>(bytesPerPixel) == 0;
+        length >= 256 && equal && (position & (static_cast<unsigned>(bytesPerPixel) - 1)) == 0;
 
     auto const fill = [&]<typename Vector>(Vector const& first, Vector const& second, Vector const& third) {
         constexpr std::ptrdiff_t kSize = sizeof(Vector);
@@ -59,10 +62,21 @@ GR_CLONES void FillWords(GrRows const& rows, int bytesPerPixel, Words words)
         }
     };
 
-    if (length >= std::ptrdiff_t{sizeof(Block)}) {
+    // Laying out three blocks costs a short row more than storing them, so equal words make one only; and
+    // from an array, since the compiler would set the words of a large vector one by one.
+    if (length >= std::ptrdiff_t{sizeof(Block)} && equal) {
+        std::uint32_t same[sizeof(Block) / sizeof a];
+        std::fill(std::begin(same), std::end(same), a);
+        Block block;
+        std::memcpy(&block, same, sizeof block);
+        fill(block, block, block);
+    } else if (length >= std::ptrdiff_t{sizeof(Block)}) {
         fill(Block{a, b, c, a, b, c, a, b, c, a, b, c, a, b, c, a},
             Block{b, c, a, b, c, a, b, c, a, b, c, a, b, c, a, b},
             Block{c, a, b, c, a, b, c, a, b, c, a, b, c, a, b, c});
+    } else if (length >= std::ptrdiff_t{sizeof(SmallBlock)} && equal) {
+        SmallBlock const block = SmallBlock{} + a;
+        fill(block, block, block);
     } else if (length >= std::ptrdiff_t{sizeof(SmallBlock)}) {
         fill(SmallBlock{a, b, c, a}, SmallBlock{b, c, a, b}, SmallBlock{c, a, b, c});
     } else {

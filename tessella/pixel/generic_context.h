@@ -3,12 +3,16 @@
 #include <common/assert.h>
 #include <tessella/bitmap.h>
 #include <tessella/coordinates.h>
+#include <tessella/pixel/arc.h>
 #include <tessella/pixel/blend_rows.h>
 #include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/color_source.h>
 #include <tessella/pixel/colors.h>
 #include <tessella/pixel/convert_rows.h>
+#include <tessella/pixel/edge_walker.h>
 #include <tessella/pixel/generic_surface.h>
+#include <tessella/pixel/line_walker.h>
+#include <tessella/pixel/polygon_walker.h>
 #include <tessella/region_cut.h>
 
 /// A picture of one bit a pixel. Its rows begin `pitch` bytes apart, the leftmost pixel in the highest or the
@@ -45,6 +49,10 @@ public:
     void DrawPixel(int x, int y) override;
     void FillRegion(GrRegion const& region) override;
     void FillRegionAlpha(GrRegion const& region, std::uint8_t alpha) override;
+    void DrawLine(int x1, int y1, int x2, int y2) override;
+    void DrawArc(int x, int y, int w, int h, int start, int sweep) override;
+    void FillArc(int x, int y, int w, int h, int start, int sweep) override;
+    void FillPolygon(std::int16_t const xy[], unsigned count) override;
     void DrawBitmap(int x, int y, GrBitmap const& bitmap) override;
     void DrawBitmapTransparent(int x, int y, GrBitmap const& bitmap) override;
     void DrawImageMasked(
@@ -74,6 +82,21 @@ protected:
     /// Paints bits from surface point `x`, `y` on: set ones through pattern and raster mode and no others, or
     /// all of them in the fore and back colour.
     void DrawBits(int x, int y, GrBits const& bits, bool transparent);
+
+private:
+    void DrawColumn(GrRegion const& region, int x) const;
+    void DrawRun(GrLineWalker line, std::uint64_t count) const;
+    template <typename Paint>
+    static void WalkOutline(GrEllipseWalk walk, Paint paint);
+    void FillEllipse(GrEllipseWalk walk, GrRegion const& region) const;
+    void FillWedges(GrArcState const& arc) const;
+
+    /// Paints the pixels of `line`, a rectangle one row high, that belong to `region`; `row` is where its row
+    /// begins.
+    void FillScan(unsigned char* row, GrRegion const& region, GrRect const& line) const;
+    /// The same with all lines that `walker` gives, one in each row.
+    template <typename Walker>
+    void FillLines(GrRegion const& region, Walker& walker) const;
 };
 
 /// The drawing operations that convert between colours and pixels.
@@ -120,3 +143,4 @@ private:
 #include <tessella/pixel/context_blend.inl>
 #include <tessella/pixel/context_convert.inl>
 #include <tessella/pixel/context_fill.inl>
+#include <tessella/pixel/context_shapes.inl>

@@ -38,6 +38,13 @@ protected:
         FillRows({address, 0, count, 1}, pixel);
     }
 
+    /// Writes `count` pixels, each `step` bytes behind the one before.
+    static void StepPixels(unsigned char* address, std::ptrdiff_t step, std::uint64_t count, Pixel pixel)
+    {
+        for (; count > 0; --count, address += step)
+            WritePixel(address, 0, pixel);
+    }
+
     void PatternPixel(
         unsigned char* row, int x, std::uint8_t patternByte, bool transparent, std::uint32_t mode) const;
 

@@ -7,7 +7,7 @@ void GrGenericSurface<Base, Surface>::PatternPixel(
     if (mode == GrRasterModeCopy)
         WritePixel(row, x, set ? foreColor : backColor);
     else
-        InvertRows({PixelAddress(row, x), 0, 1, 1}, kBytes);
+        WritePixel(row, x, static_cast<Pixel>(~ReadPixel(row, x)));
 }
 
 template <typename Base, GrSurfacePolicy Surface>
@@ -42,6 +42,13 @@ void GrGenericSurface<Base, Surface>::PatternColumn(
 {
     std::uint8_t const mask = static_cast<std::uint8_t>(1u << (x & 7));
     unsigned char* row = RowAddress(y);
+    std::uint64_t columns;
+    std::memcpy(&columns, this->pattern, sizeof columns);
+    std::uint64_t const masks = mask * 0x0101010101010101u;
+    if ((columns & masks) == masks) {
+        StepPixels(PixelAddress(row, x), this->Stride(), static_cast<unsigned>(count), setPixel);
+        return;
+    }
     for (int const end = y + count; y < end; ++y, row += this->Stride()) {
         bool const set = this->pattern[y & 7] & mask;
         if (set || !this->patternTransparent) WritePixel(row, x, set ? setPixel : clearPixel);

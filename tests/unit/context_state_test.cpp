@@ -119,7 +119,8 @@ TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
              Slot(&GrContext::GetOrigin), Slot(&GrContext::SetBackColor), Slot(&GrContext::SetForeColor),
              Slot(&GrContext::SetPattern), Slot(&GrContext::SetRasterMode), Slot(&GrContext::GetRasterMode),
              Slot(&GrContext::GetPixel), Slot(&GrContext::DrawPixel), Slot(&GrContext::FillRegion),
-             Slot(&GrContext::FillRegionAlpha), Slot(&GrContext::DrawBitmap),
+             Slot(&GrContext::FillRegionAlpha), Slot(&GrContext::DrawLine), Slot(&GrContext::DrawArc),
+             Slot(&GrContext::FillArc), Slot(&GrContext::FillPolygon), Slot(&GrContext::DrawBitmap),
              Slot(&GrContext::DrawBitmapTransparent), Slot(&GrContext::DrawImageMasked),
              Slot(&GrContext::DrawImage), Slot(&GrContext::DrawImageAlpha), Slot(&GrContext::ReadImage),
              Slot(&GrContext::DrawImageMaskedDirect), Slot(&GrContext::DrawImageDirect),
@@ -144,6 +145,11 @@ TEST(ContextState, CoordinatesBeyondTheirRangeAreClippedAway)
         EXPECT_EQ(context->GetPixel(-origin, -origin), static_cast<GrColor>(100 + origin));
         context->DrawPixel(kMax, kMin);
         EXPECT_EQ(context->GetPixel(kMin, kMax), 0u);
+        context->SetForeColor(static_cast<GrColor>(200 + origin));
+        context->DrawLine(kMax, kMax, kMin, kMin);
+        EXPECT_EQ(context->GetPixel(1 - origin, 1 - origin), static_cast<GrColor>(200 + origin));
+        context->DrawArc(kMax - 2, kMax - 2, 5, 5, kMin, kMin);
+        context->FillArc(kMin, 0, kMax, 2, kMax, 100);
         context->ExcludeClipRect({kMin, kMin, kMax, kMax});
         EXPECT_EQ(ClipRect(*context), (GrRect{-origin, -origin, -origin, -origin}));
     }
@@ -240,6 +246,12 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
                                },
                               true},
              Case{[&] { context->FillRegion(GrRegion()); }, true},
+             Case{[&] { context->DrawLine(1, 1, 1, 5); }, true},
+             Case{[&] { context->DrawLine(16, 1, 20, 5); }, false},
+             Case{[&] { context->DrawArc(9, 9, 20, 20, 0, 5760); }, false},
+             Case{[&] { context->FillArc(9, 9, 20, 20, 5760, 5760); }, true},
+             Case{[&] { context->FillArc(50, 50, 20, 20, 100, 200); }, false},
+             Case{[&] { context->FillArc(0, -8, 20, 20, 5760, 2000); }, true},
              Case{[&] { context->DrawPixel(1, 1); }, true}, Case{[&] { context->GetPixel(1, 1); }, true},
              Case{[&] { context->DrawPixel(16, 1); }, false},
              Case{[&] { context->GetPixel(1, -1); }, false}}) {

@@ -1,4 +1,5 @@
 #include <support/canvas.h>
+#include <support/shape_model.h>
 #include <tessella/pixel/image_contexts.h>
 #include <tessella/screen.h>
 #include <tessella/screen_guard.h>
@@ -26,7 +27,7 @@ public:
 
     void Step()
     {
-        switch (Number(0, 11)) {
+        switch (Number(0, 17)) {
         case 0: Both([region = Shape()](auto& c) { c.SetClipRegion(region); }); break;
         case 1: {
             GrRect const rect = Rect();
@@ -56,7 +57,9 @@ public:
             EXPECT_EQ(context.GetPixel(x, y), canvas.GetPixel(x, y)) << x << ", " << y;
             break;
         }
-        default: Both([region = Shape()](auto& c) { c.FillRegion(region); });
+        case 10:
+        case 11: Both([region = Shape()](auto& c) { c.FillRegion(region); }); break;
+        default: DrawShape();
         }
     }
 
@@ -67,6 +70,30 @@ private:
         operation(context);
         operation(canvas);
     }
+
+    void DrawShape()
+    {
+        auto const paint = [this](int px, int py) { canvas.DrawPixel(px, py); };
+        int const x = Number(-30, kWidth), y = Number(-30, kHeight), w = Number(-2, 60), h = Number(-2, 40);
+        int const x2 = Number(0, 4) ? Number(-30, kWidth + 30) : x, y2 = Number(0, 4) ? y + h : y;
+        int const start = Angle(), sweep = Angle();
+        std::vector<std::int16_t> xy(static_cast<std::size_t>(2 * Number(2, 7)));
+        for (auto& coordinate : xy)
+            coordinate = static_cast<std::int16_t>(Number(-20, kWidth));
+        switch (Number(0, 3)) {
+        case 0: context.DrawLine(x, y, x2, y2), model::Line(paint, x, y, x2, y2); break;
+        case 1:
+            context.FillPolygon(xy.data(), static_cast<unsigned>(xy.size() / 2));
+            model::Polygon(paint, xy);
+            break;
+        case 2:
+            context.DrawArc(x, y, w, h, start, sweep);
+            model::DrawArc(paint, x, y, w, h, start, sweep);
+            break;
+        default: context.FillArc(x, y, w, h, start, sweep); model::FillArc(paint, x, y, w, h, start, sweep);
+        }
+    }
+    int Angle() { return Number(0, 2) ? Number(-40000, 40000) : Number(-9, 9) * 2880; }
 
     int Number(int from, int to) { return std::uniform_int_distribution(from, to)(random); }
     GrColor Color() { return static_cast<GrColor>(random()); }

@@ -1,10 +1,17 @@
 #include <tessella/pixel/fill_rows.h>
 
-#include <tessella/pixel/clones.h>
-
 #include <algorithm>
 #include <cstring>
 #include <iterator>
+
+// Sanitizers would instrument the choice of the version too, which happens before they are ready; and clang
+// does not know the names of these processors.
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__) || defined(__clang__) ||                   \
+    !defined(__x86_64__)
+#define GR_CLONES
+#else
+#define GR_CLONES __attribute__((target_clones("arch=x86-64-v4", "avx2", "default")))
+#endif
 
 namespace {
 

@@ -2,6 +2,7 @@
 
 #include <tessella/context.h>
 
+#include <array>
 #include <cstdint>
 #include <cstring>
 #include <functional>
@@ -27,15 +28,41 @@ public:
             [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); }};
     }
 
+    /// Error diffusion, a pixel at a time: half to the right, half down.
+    class Errors {
+    public:
+        explicit Errors(int columns = 0) : above(static_cast<std::size_t>(columns)) {}
+        void StartRow() { left = {}; }
+        std::uint32_t Diffuse(Format const& to, GrColor color, int x)
+        {
+            auto& column = above[static_cast<std::size_t>(x)];
+            GrColor wanted = 0xFF000000;
+            for (std::size_t i = 0; i < 3; ++i) {
+                int const sum = static_cast<int>(color >> 8 * i & 255) + column[i] + left[i];
+                wanted |= static_cast<GrColor>(sum < 0 ? 0 : sum > 255 ? 255 : sum) << 8 * i;
+            }
+            std::uint32_t const pixel = to.toPixel(wanted);
+            GrColor const reached = to.fromPixel(pixel);
+            for (std::size_t i = 0; i < 3; ++i)
+                left[i] = column[i] = (int(wanted >> 8 * i & 255) - int(reached >> 8 * i & 255)) / 2;
+            return pixel;
+        }
+
+    private:
+        std::vector<std::array<int, 3>> above;
+        std::array<int, 3> left = {};
+    };
+
     Format const format;
+    int const width, height;
     std::vector<unsigned char> memory;
     int originX = 0, originY = 0;
     std::uint32_t fore = 0, back;
 
     Canvas(Format pixelFormat, int surfaceWidth, int surfaceHeight, int surfaceStride)
-        : format(std::move(pixelFormat)), memory(static_cast<std::size_t>(surfaceStride * surfaceHeight)),
-          back(format.allBits), width(surfaceWidth), height(surfaceHeight), stride(surfaceStride),
-          limit(static_cast<std::size_t>(width * height), true), clip(limit)
+        : format(std::move(pixelFormat)), width(surfaceWidth), height(surfaceHeight),
+          memory(static_cast<std::size_t>(surfaceStride * surfaceHeight)), back(format.allBits),
+          stride(surfaceStride), limit(static_cast<std::size_t>(width * height), true), clip(limit)
     {}
 
     void SetClipRegion(GrRegion const& region)
@@ -123,7 +150,7 @@ private:
     }
     std::size_t Offset(int x, int y) const { return static_cast<std::size_t>(y * stride + x * format.bytes); }
 
-    int width, height, stride;
+    int stride;
     std::vector<bool> limit, clip;
     int baseX = 0, baseY = 0;
     bool pattern[8][8] = {{1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1}, {1, 1, 1, 1, 1, 1, 1, 1},

@@ -1,4 +1,5 @@
 #include <support/canvas.h>
+#include <support/random_blits.h>
 #include <support/shape_model.h>
 #include <tessella/pixel/image_contexts.h>
 #include <tessella/screen.h>
@@ -132,8 +133,11 @@ void Judge(GrContext& context, unsigned char const* pixels, Canvas& canvas)
     unsigned const seed = std::random_device{}();
     SCOPED_TRACE("seed " + std::to_string(seed));
     RandomDrawing drawing(context, canvas, seed);
+    RandomBlits blits(context, canvas, ~seed);
     for (int step = 0; step < 3000; ++step) {
         drawing.Step();
+        if (step % 3 == 0) blits.Step();
+        ASSERT_FALSE(testing::Test::HasFailure()) << "step " << step;
         ASSERT_EQ(std::memcmp(pixels, canvas.memory.data(), canvas.memory.size()), 0) << "step " << step;
     }
 }
@@ -176,6 +180,8 @@ void JudgeScreen(unsigned bits, unsigned colorBits)
     ResetScreen const reset;
     GrScreen.fbMemory = memory.data();
     GrScreen.stride = static_cast<std::uint32_t>(stride);
+    std::vector<std::int32_t> errors(kWidth * 3);
+    GrScreen.ditherLine = errors.data();
     auto const* const mode = FindVideoMode(bits, colorBits);
     ASSERT_NE(mode, nullptr);
     GrRegion const limit = GrRect{2, 1, kWidth - 3, kHeight - 4};

@@ -1,5 +1,5 @@
 tessella_test(NAME pixel_test LABEL unit SOURCES
-    blit_test.cpp
+    blend_test.cpp
     colors_test.cpp
     context_test.cpp
     context_state_test.cpp

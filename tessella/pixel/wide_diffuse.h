@@ -1,13 +1,11 @@
-#include <tessella/pixel/diffuse_rows.h>
+#pragma once
 
 #include <tessella/pixel/diffuse_wave.h>
 #include <tessella/pixel/wide_source.h>
 
 #include <algorithm>
 
-namespace {
-
-constexpr int kFewColumns = 96;  // so few that the error rows have no room for a wave's cells
+inline constexpr int kFewColumns = 96;  // so few that the error rows have no room for a wave's cells
 
 /// The colours of a row's columns `from` to `to`, as they are wanted before any errors come in. Those that
 /// are not drawn are 0; all others have a top byte of 255.
@@ -15,27 +13,29 @@ template <typename Format, bool kHasColors, bool kHasAlphas>
 GR_INLINE void FillColors(WideSource<Format, kHasColors, kHasAlphas>& source, std::ptrdiff_t y, int from,
     int to, std::uint32_t* colors)
 {
+    using W = typename Format::Wide;
+    using Words = typename W::Words;
     GrBlend const& blend = source.blend;
     unsigned char const* const row = blend.target.address + y * blend.target.stride;
-    for (int next = from; next < to; next += kWide) {
-        int const x = WideStart(next, from, to);
+    for (int next = from; next < to; next += W::kLanes) {
+        int const x = W::Start(next, from, to);
         int const count = to - x;
         source.Load(y, x, count);
-        WideWords wanted = source.color | 0xFF000000;
-        if (source.run == AlphaRun::Clear) wanted = WideWords{};
+        Words wanted = source.color | 0xFF000000;
+        if (source.run == AlphaRun::Clear) wanted = Words{};
         if (source.run == AlphaRun::Mixed) {
-            WideWords below = Splat(blend.back);
-            if (blend.overDestination)
-                below = Format::Load(row + std::ptrdiff_t{x} * Format::Width::kBytes, count);
-            WideWords const mixed = source.MixedOver(below);
+            Words below = W::Splat(blend.back);
+            if (blend.overDestination) below = Format::Load(row + std::ptrdiff_t{x} * Format::kBytes, count);
+            Words const mixed = source.MixedOver(below);
             if constexpr (kHasAlphas) {
                 wanted = source.alpha == 255 ? wanted : mixed;
-                wanted = source.alpha == 0 ? WideWords{} : wanted;
+                wanted = source.alpha == 0 ? Words{} : wanted;
             } else {
                 wanted = mixed;
             }
         }
-        StoreSome<4>(reinterpret_cast<unsigned char*>(colors + (x - from)), count, wanted);
+        W::template Store<std::uint32_t>(
+            reinterpret_cast<unsigned char*>(colors + (x - from)), count, wanted);
     }
 }
 
@@ -44,19 +44,20 @@ template <typename Format, bool kHasAlphas>
 GR_INLINE void StoreColors(
     GrBlend const& blend, std::ptrdiff_t y, int from, int to, std::uint32_t const* colors)
 {
-    using Signs = std::int32_t __attribute__((vector_size(64)));
+    using W = typename Format::Wide;
+    using Words = typename W::Words;
     unsigned char* const row = blend.target.address + y * blend.target.stride;
-    for (int next = from; next < to; next += kWide) {
-        int const x = WideStart(next, from, to);
+    for (int next = from; next < to; next += W::kLanes) {
+        int const x = W::Start(next, from, to);
         int const count = to - x;
-        unsigned char* const address = row + std::ptrdiff_t{x} * Format::Width::kBytes;
+        unsigned char* const address = row + std::ptrdiff_t{x} * Format::kBytes;
         auto const* const words = reinterpret_cast<unsigned char const*>(colors + (x - from));
-        auto const reached = LoadSome<4, WideWords>(words, count);
-        WideWords pixels = Format::ToPixels(reached);
+        auto const reached = W::template Load<std::uint32_t>(words, count);
+        Words pixels = Format::ToPixels(reached);
         if constexpr (kHasAlphas) {
-            WideWords kept = Splat(blend.back);
+            Words kept = W::Splat(blend.back);
             if (blend.overDestination) kept = Format::Load(address, count);
-            pixels = (Signs)reached < 0 ? pixels : kept;
+            pixels = (typename W::Signs)reached < 0 ? pixels : kept;
         }
         Format::Store(address, count, pixels);
     }
@@ -93,25 +94,18 @@ GR_INLINE void DiffuseWide(GrBlend const& blend)
     }
 }
 
-template <typename Format, typename Part>
+template <typename Colors>
+using PartOf = std::conditional_t<std::is_same_v<Colors, GrColors8>, WavePart8,
+    WavePart16<std::is_same_v<Colors, GrColors15> ? 0x00060606 : 0x00060206>>;
+
+template <typename Format>
 GR_INLINE void DiffuseFormat(GrBlend const& blend)
 {
+    using Part = PartOf<typename Format::Policy>;
     if (blend.colors)
         blend.alphas ? DiffuseWide<Format, Part, true, true>(blend)
                      : DiffuseWide<Format, Part, true, false>(blend);
     else
         blend.alphas ? DiffuseWide<Format, Part, false, true>(blend)
                      : DiffuseWide<Format, Part, false, false>(blend);
-}
-
-}
-
-GR_CLONES void DiffuseRows(Wide8, GrBlend const& blend) { DiffuseFormat<Wide8, WavePart8>(blend); }
-GR_CLONES void DiffuseRows(Wide15, GrBlend const& blend)
-{
-    DiffuseFormat<Wide15, WavePart16<0x00060606>>(blend);
-}
-GR_CLONES void DiffuseRows(Wide16, GrBlend const& blend)
-{
-    DiffuseFormat<Wide16, WavePart16<0x00060206>>(blend);
 }

@@ -1,0 +1,34 @@
+#include <tessella/pixel/wide_blend.h>
+#include <tessella/pixel/wide_convert.h>
+#include <tessella/pixel/wide_diffuse.h>
+#include <tessella/pixel/wide_rows.h>
+
+template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
+void GrWideRows<kLanes, Surface, Colors>::Blend(GrBlend const& blend)
+{
+    using Format = GrWideFormat<GrWide<kLanes>, Surface, Colors>;
+    // Where nothing is drawn, nothing is diffused.
+    bool const diffuses = blend.errors && (blend.alphas || blend.alpha != 0);
+    if constexpr (Colors::kDithers)
+        if (diffuses) return DiffuseFormat<Format>(blend);
+    BlendFormat<Format>(blend);
+}
+
+template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
+void GrWideRows<kLanes, Surface, Colors>::Read(unsigned char const* pixels, int count, GrColor* colors)
+{
+    ReadWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
+}
+
+template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
+void GrWideRows<kLanes, Surface, Colors>::Write(unsigned char* pixels, int count, GrColor const* colors)
+{
+    WriteWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
+}
+
+template struct GrWideRows<kLanesHere, GrSurface8, GrColors8>;
+template struct GrWideRows<kLanesHere, GrSurface16, GrColors15>;
+template struct GrWideRows<kLanesHere, GrSurface16, GrColors16>;
+template struct GrWideRows<kLanesHere, GrSurface24, GrColors24>;
+template struct GrWideRows<kLanesHere, GrSurface32, GrColors24>;
+template struct GrWideRows<kLanesHere, GrSurface32, GrColorsRGB>;

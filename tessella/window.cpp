@@ -112,11 +112,12 @@ GrWindow::~GrWindow()
     GR_ASSERT_TEXT(!first, "first == 0");
     GR_ASSERT_TEXT(!last, "last == 0");
     GR_ASSERT_TEXT(Callback, "Callback != 0");
-    while (first) {
-        GrWindow& orphan = *first;
-        Unlink(orphan);
-        orphan.parent = nullptr;
+    for (GrWindow* orphan = first; orphan;) {
+        GrWindow* const following = orphan->next;
+        orphan->parent = orphan->prev = orphan->next = nullptr;
+        orphan = following;
     }
+    first = last = nullptr;
     Send(GrEventWindowDestroyed, this);
     if (IsVisible()) FullInvalidate(false);
     RemoveFromParent();

@@ -15,15 +15,15 @@
 ///
 /// The application makes cursors, has one shown and deletes them, on its own thread during a session. After a
 /// change of mode no cursor is current, and new ones must be made: they belong to the mode that they were
-/// made in. All else here is for the library.
-class GR_API GrCursor {
+/// made in. All else here is for the library, and not exported.
+class GrCursor {
 public:
     /// A new cursor with its hot spot, the pixel that points, at `hotX`, `hotY` of `image`, whose size is the
     /// cursor's. Cursor and caller part here: the cursor owns image and mask. The caller deletes the cursor.
     ///
     /// With a mask, of the image's size, its set pixels are shown; the image must be in the screen's format.
     /// With null, a true-colour image is blended by its alpha plane, which it must have.
-    static GrCursor* CreateInstance(GrImage* image, GrBitmap* mask, int hotX, int hotY);
+    GR_API static GrCursor* CreateInstance(GrImage* image, GrBitmap* mask, int hotX, int hotY);
 
     GrCursor(GrCursor const&) = delete;
     GrCursor& operator=(GrCursor const&) = delete;
@@ -51,29 +51,34 @@ public:
     void Move(int newX, int newY);
 
 protected:
+    /// For the classes that know how to draw the shape.
     GrCursor(GrImage* shape, GrBitmap* shapeMask, int hotSpotX, int hotSpotY);
 
     /// Ceases to be current. The first thing in each destructor of a class that can be made: until then the
     /// mouse's thread may be drawing the shape.
     void Retire();
 
-    // The screen's lock guards all that changes.
-    std::unique_ptr<GrImage> const image;
-    std::unique_ptr<GrBitmap> const mask;
-    std::int32_t const hotX, hotY;
-    std::int32_t x = 0, y = 0;        // of the hot spot, on the screen
-    std::int32_t oldX = 0, oldY = 0;  // before the last move
-    GrRect shownRect{};               // what the drawn cursor covers of the screen
-    GrRect fullRect{};                // the same with what lies beside the screen
+    std::unique_ptr<GrImage> const image;  ///< the shape
+    std::unique_ptr<GrBitmap> const mask;  ///< null for shapes with alpha
+    std::int32_t const hotX;               ///< the hot spot, in the image
+    std::int32_t const hotY;               ///< the same
 
-    // How the places before and after a short move lie to each other.
-    GrRect overlapRect{};
-    GrRect restoreTopRect{}, restoreSideRect{};
-    GrRect newSideRect{}, newTopRect{};
+    // All that changes is guarded by the screen's lock.
+    std::int32_t x = 0;        ///< where the hot spot is on the screen
+    std::int32_t y = 0;        ///< the same
+    std::int32_t oldX = 0;     ///< the same before the last move
+    std::int32_t oldY = 0;     ///< the same
+    GrRect shownRect{};        ///< what the drawn cursor covers of the screen
+    GrRect fullRect{};         ///< the same with what lies beside the screen
+    GrRect overlapRect{};      ///< what the places before and after a short move have in common
+    GrRect restoreTopRect{};   ///< what such a move leaves, above or below
+    GrRect restoreSideRect{};  ///< what it leaves at the side of the overlap
+    GrRect newSideRect{};      ///< what it gains at the side of the overlap
+    GrRect newTopRect{};       ///< what it gains above or below
 
-    std::unique_ptr<GrImage> const composeImage;
-    std::unique_ptr<GrContext> const composeContext;
-    std::unique_ptr<GrImage> const saveImage;  // the pixels under the drawn cursor
+    std::unique_ptr<GrImage> const composeImage;      ///< where the picture after a short move is made
+    std::unique_ptr<GrContext> const composeContext;  ///< over it
+    std::unique_ptr<GrImage> const saveImage;         ///< the pixels under the drawn cursor
 
 private:
     friend class GrScreenGuard;

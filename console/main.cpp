@@ -6,7 +6,9 @@
 
 #include <cstdio>
 #include <filesystem>
+#include <optional>
 #include <system_error>
+#include <utility>
 
 namespace {
 
@@ -32,21 +34,24 @@ std::string FindPreloaded()
     return {};
 }
 
-int Run(console::Options const& options, std::string const& preloaded)
+int Run(console::Options const& options, std::string const& preloaded, console::Script const* script)
 {
     console::VirtualConsole virtualConsole(options.setup);
-    int status = 0;
+    console::RunOutcome outcome;
     try {
-        status = console::RunProgram(virtualConsole, preloaded, options.program);
+        outcome = console::RunProgram(virtualConsole, preloaded, options.program, script);
     } catch (std::system_error const& error) {
         return Complain(std::string("cannot run ") + error.what(), kProgramFailed);
     }
+    if (!outcome.scriptProblem.empty())
+        outcome.status =
+            Complain(outcome.scriptProblem, outcome.status != 0 ? outcome.status : kConsoleFailed);
     if (!options.screenshot.empty()) {
         auto const problem = console::SavePicture(virtualConsole.Screen(), options.screenshot);
         if (!problem.empty())
             return Complain("cannot write " + options.screenshot + ": " + problem, kConsoleFailed);
     }
-    return status;
+    return outcome.status;
 }
 
 int Follow(std::span<char*> words)
@@ -59,6 +64,17 @@ int Follow(std::span<char*> words)
         std::fputs(console::kHelp, stdout);
         return 0;
     }
+    std::optional<console::Script> script;
+    if (!options.script.empty()) {
+        auto parsed = console::ReadScript(options.script);
+        if (auto const* const problem = std::get_if<std::string>(&parsed))
+            return Complain(*problem, kConsoleFailed);
+        script = std::get<console::Script>(std::move(parsed));
+    }
+    if (options.printSteps) {
+        std::fputs(console::PrintSteps(*script).c_str(), stdout);
+        return 0;
+    }
     auto const preloaded = FindPreloaded();
     if (preloaded.empty())
         return Complain("its preloaded object " TESSELLA_CONSOLE_OBJECT " is missing", kConsoleFailed);
@@ -66,7 +82,7 @@ int Follow(std::span<char*> words)
     if (preloaded.find_first_of(" :") != std::string::npos)
         return Complain(
             "it cannot work from " + preloaded + ", a path with blanks or colons", kConsoleFailed);
-    return Run(options, preloaded);
+    return Run(options, preloaded, script ? &*script : nullptr);
 }
 
 }

@@ -14,6 +14,9 @@ at the device paths where programs look for them. No root, no device and no chan
                               24 (three bytes a pixel) and 32 (24 bits of colour in four bytes)
   --pitch BYTES               bytes from one row to the next, if more than the pixels need
   --screenshot FILE.png       when the program has ended, however it did, write what the screen shows
+  --script FILE               do at the console what the file says: move the mouse, press its buttons, type
+                              keys, switch consoles, take screenshots, end the program; see below
+  --print-steps               print the single steps that the script comes down to, and run nothing
   --fault REQUEST=ERRNO       let a call fail, always. May be repeated. REQUEST is OPEN_FB, OPEN_TTY,
                               OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
                               FBIOGET_VSCREENINFO, FBIOPUTCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE, KDSETMODE,
@@ -25,8 +28,28 @@ at the device paths where programs look for them. No root, no device and no chan
                               whatever the mode is: to see how a program takes a mode that it doesn't support
   --help                      show this
 
-The exit status is the program's, or 128 and the signal's number if one killed it; 2 if the console couldn't
-do its part; 127 if the program couldn't be run.
+A script has one command a line; what follows a word that begins with # is a comment. Times are milliseconds.
+
+  move DX DY                  move the mouse, right and downward, by -127 to 127 counts
+  press BUTTON                press or release left, right or middle
+  release BUTTON
+  click [BUTTON]              both, left if no button is given
+  wheel up|down [NOTCHES]     turn the wheel, one notch if no number is given
+  type KEY...                 press and release keys: type a shift-b ctrl-alt-f2 ret. They have QEMU's names
+  keys CODE...                key codes in hexadecimal digits, with 80 added for a release
+  wait TIME                   do nothing
+  settle [QUIET [LIMIT]]      wait until the picture hasn't changed for a time, 200 if not given; the script
+                              fails if it still changes at the limit, 10000 if not given
+  screenshot FILE.png         write what the screen shows
+  switch CONSOLE              switch to console 1, the program's, to 63
+  quit                        end the program (SIGTERM; SIGKILL 5 seconds later). Without this it goes on
+
+Each command waits, for 10 seconds at most, until the program has got ready for it. A command that cannot be
+carried out ends the program.
+
+The exit status is the program's, or 128 and the signal's number if one killed it, but 0 if the script's quit
+ended it; 2 if the console or the script couldn't do its part and the program reports no failure of its own;
+127 if the program couldn't be run.
 )";
 
 namespace {
@@ -50,8 +73,8 @@ private:
 
 bool TakesValue(std::string_view name)
 {
-    return name == "--mode" || name == "--pitch" || name == "--screenshot" || name == "--fault" ||
-        name == "--report";
+    return name == "--mode" || name == "--pitch" || name == "--screenshot" || name == "--script" ||
+        name == "--fault" || name == "--report";
 }
 
 Problem Reader::ReadValue(std::string_view name, std::string_view value)
@@ -70,6 +93,9 @@ Problem Reader::ReadValue(std::string_view name, std::string_view value)
     } else if (name == "--screenshot") {
         if (value.empty()) return "--screenshot needs the name of a file";
         options.screenshot = value;
+    } else if (name == "--script") {
+        if (value.empty()) return "--script needs the name of a file";
+        options.script = value;
     } else if (name == "--fault") {
         auto const fault = ParseFault(value);
         if (!fault)
@@ -84,7 +110,8 @@ Problem Reader::ReadValue(std::string_view name, std::string_view value)
 
 Problem Reader::Finish()
 {
-    if (options.program.empty()) return "no program is given";
+    if (options.printSteps && options.script.empty()) return "--print-steps needs a script";
+    if (options.program.empty() && !options.printSteps) return "no program is given";
     if (!pitch) return {};
     if (!IsPitchValid(options.setup.mode, *pitch))
         return "the mode's rows cannot be " + std::to_string(*pitch) + " bytes apart; its pixels need " +
@@ -104,6 +131,10 @@ std::variant<Options, Problem> Reader::Read(std::span<char*> words)
         if (word == "--help") {
             options.help = true;
             return options;
+        }
+        if (word == "--print-steps") {
+            options.printSteps = true;
+            continue;
         }
         auto const equals = word.find('=');
         auto const name = word.substr(0, equals);

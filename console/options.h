@@ -12,6 +12,8 @@ namespace console {
 struct Options {
     Setup setup;
     std::string screenshot;    ///< a file's path, empty for none
+    std::string script;        ///< likewise
+    bool printSteps = false;   ///< of the script, and run nothing
     bool help = false;         ///< nothing else counts then
     std::span<char*> program;  ///< with its arguments; part of the command line
 };

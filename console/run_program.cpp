@@ -1,11 +1,13 @@
 #include <console/run_program.h>
 
 #include <console/environment.h>
+#include <console/script_player.h>
 
 #include <array>
 #include <cerrno>
 #include <csignal>
 #include <cstdlib>
+#include <optional>
 #include <system_error>
 
 #include <fcntl.h>
@@ -109,20 +111,35 @@ void TakeOff(int tty)
 
 }
 
-int RunProgram(VirtualConsole& console, std::string const& preloaded, std::span<char*> program)
+RunOutcome RunProgram(
+    VirtualConsole& console, std::string const& preloaded, std::span<char*> program, Script const* script)
 {
     SignalQueue const signals;
     SetEnvironment(console, preloaded);
     pid_t const child = Start(signals, program);
+    std::optional<ScriptPlayer> player;
+    if (script != nullptr) player.emplace(console, *script);
+    int const playerFd = player ? player->SignalFd() : -1;
+    bool asked = false;
     int status = 0;
     while (waitpid(child, &status, WNOHANG) == 0) {
-        std::array<pollfd, 2> events = {
-            pollfd{signals.Fd(), POLLIN, 0}, pollfd{console.KeyboardFd(), POLLIN, 0}};
+        std::array<pollfd, 3> events = {pollfd{signals.Fd(), POLLIN, 0},
+            pollfd{console.KeyboardFd(), POLLIN, 0}, pollfd{playerFd, POLLIN, 0}};
         poll(events.data(), events.size(), -1);
         signals.ForwardTo(child);
         TakeOff(console.KeyboardFd());
+        if (int const signal = player ? player->TakeSignal() : 0; signal != 0) {
+            kill(child, signal);
+            asked = true;
+        }
     }
-    return WIFSIGNALED(status) ? 128 + WTERMSIG(status) : WEXITSTATUS(status);
+    RunOutcome outcome;
+    if (player) outcome.scriptProblem = player->Stop();
+    if (!WIFSIGNALED(status))
+        outcome.status = WEXITSTATUS(status);
+    else if (!asked || WTERMSIG(status) != SIGTERM)
+        outcome.status = 128 + WTERMSIG(status);
+    return outcome;
 }
 
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <console/script.h>
 #include <console/virtual_console.h>
 
 #include <span>
@@ -7,11 +8,19 @@
 
 namespace console {
 
-/// Runs a program on a console until it ends. Meanwhile signals that ask this process to end are handed to
-/// it, and what it writes to the tty is taken off. If this process dies, so does the program. Gives the
-/// program's exit status, or 128 and the number of the signal that killed it. Throws `std::system_error` if
-/// the program cannot be run. `preloaded` is the path of the preloaded object; `program`, the program's name
-/// and arguments, ends before a null pointer. For a process of one thread.
-int RunProgram(VirtualConsole& console, std::string const& preloaded, std::span<char*> program);
+struct RunOutcome {
+    /// The program's exit status, or 128 and the number of the signal that killed it; 0 if that was the
+    /// script's request to end.
+    int status = 0;
+    std::string scriptProblem;  ///< why the script wasn't played to its end; see `ScriptPlayer::Stop`
+};
+
+/// Runs a program on a console until it ends, and plays a script beside it unless that is null. Meanwhile
+/// signals that ask this process to end are handed to it, and what it writes to the tty is taken off. If this
+/// process dies, so does the program. Throws `std::system_error` if the program cannot be run. `preloaded` is
+/// the path of the preloaded object; `program`, the program's name and arguments, ends before a null pointer.
+/// For a process of one thread.
+RunOutcome RunProgram(
+    VirtualConsole& console, std::string const& preloaded, std::span<char*> program, Script const* script);
 
 }

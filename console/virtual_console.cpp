@@ -10,6 +10,7 @@
 #include <new>
 
 #include <fcntl.h>
+#include <poll.h>
 #include <sys/mman.h>
 #include <sys/socket.h>
 #include <unistd.h>
@@ -181,6 +182,19 @@ bool VirtualConsole::MoveMouse(int dx, int dy, int wheel, unsigned buttons)
 {
     StateLock const lock(*state);
     return MouseModel(*state).Move(dx, dy, wheel, buttons);
+}
+
+bool VirtualConsole::IsMouseRead() const
+{
+    pollfd reports{mouseProgram.Get(), POLLIN, 0};
+    return state->mouseOpens.load(std::memory_order_acquire) != 0 && poll(&reports, 1, 0) == 0;
+}
+
+bool VirtualConsole::AreKeysRead()
+{
+    // Bytes are on their way for a moment. Only a poll that finds none waits for them.
+    pollfd keys{ttySlave.Get(), POLLIN, 0};
+    return Tty().keyboardMode == K_MEDIUMRAW && (Terminal().c_lflag & ICANON) == 0 && poll(&keys, 1, 0) == 0;
 }
 
 bool VirtualConsole::SwitchTo(unsigned console)

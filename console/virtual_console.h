@@ -75,6 +75,11 @@ public:
     bool TypeKeys(std::span<unsigned char const> bytes);
     /// See `MouseModel::Move`.
     bool MoveMouse(int dx, int dy, int wheel = 0, unsigned buttons = 0);
+    /// True if a program has opened the mouse and read all that came from it, answers included.
+    bool IsMouseRead() const;
+    /// True if the keyboard gives codes in medium raw mode, the tty hands them on as they come, and all that
+    /// have reached it are read.
+    bool AreKeysRead();
     /// The user asks for another console; the program has its say. Console 1 is the program's. False if there
     /// is no console of that number.
     bool SwitchTo(unsigned console);

@@ -110,6 +110,57 @@ TEST(ConsoleTool, StatusAndMessageTellWhatWentWrong)
     }
 }
 
+TEST(ConsoleTool, ScriptPlaysBesideTheProgram)
+{
+    auto const played = [](std::string const& script, std::string const& words) {
+        return Shell("printf '" + script + "' | " CONSOLE_TOOL " --script /dev/stdin " + words);
+    };
+    auto const whole = played("move 3 -2\\nclick right\\nwheel up\\ntype a\\nswitch 2\\ntype b\\nswitch 1\\n"
+                              "settle 50\\nscreenshot " +
+            kScreenshot + "\\nquit",
+        INPUT_PROBE);
+    EXPECT_EQ(whole.status, 0);
+    EXPECT_EQ(whole.out,
+        "mouse answers fa 03\nmouse 08 03 02 00\nmouse 0a 00 00 00\nmouse 08 00 00 00\n"
+        "mouse 08 00 00 ff\nkey 1e\nkey 9e\nreleased\nacquired\n");
+    EXPECT_EQ(unlink(kScreenshot.c_str()), 0);
+    struct {
+        int status;
+        char const *script, *words, *text;
+    } const cases[] = {
+        {2, "quit\\nquit", "-- echo started", "console: /dev/stdin:2: a command after 'quit'\n"},
+        {2, "", "--print-steps --script= -- true", "--script needs the name of a file"},
+        {2, "", "--script /nonexistent -- true", "cannot read /nonexistent: No such file"},
+        {2, "", "--script / -- true", "cannot read /: Is a directory"},
+        {0, "click", "--print-steps", "press left\nrelease left\n"}, {0, "quit", "-- sleep 60", ""},
+        {5, "wait 300\\nquit", "-- sh -c \"trap 'exit 5' TERM; sleep 2 & wait\"", ""},
+        {0, "wait 1", "-- sleep 0.2", ""},
+        {3, "wait 60000", "-- sh -c 'exit 3'", "stdin:1: the program ended"},
+        {2, "\\nclick", "-- sleep 0.1", "/dev/stdin:2: the program ended before this was done\n"},
+        {2, "screenshot /nonexistent/a.png", INPUT_PROBE, "stdin:1: cannot write /nonexistent/a.png"},
+        {2, "settle 300 900",
+            "--mode 7x3x32 -- sh -c 'while :; do " DEVICE_PROBE " 0 $((i+=1)) >/dev/null; done'",
+            "stdin:1: the screen did not stand still for 300 ms within 900 ms"}};
+    for (auto const& [status, script, words, text] : cases) {
+        auto const outcome = played(script, words);
+        EXPECT_EQ(outcome.status, status) << script;
+        EXPECT_TRUE(*text ? outcome.out.find(text) != std::string::npos : outcome.out.empty()) << outcome.out;
+    }
+}
+
+TEST(ConsoleTool, ScriptDoesNotWaitForEver)
+{
+    // Both at once, since each takes its time.
+    auto const outcome =
+        Shell("printf 'wait 300\\nquit' >" + kScreenshot + "; " CONSOLE_TOOL " --script " + kScreenshot +
+            " -- sh -c \"trap '' TERM; while :; do sleep 1; done\" & "
+            "echo click | " CONSOLE_TOOL " --script /dev/stdin -- sleep 60; echo $?; wait $!; echo $?");
+    EXPECT_EQ(outcome.out,
+        "tessella-console: /dev/stdin:1: the program has not opened the mouse and read its answers within "
+        "10000 ms\n2\n137\n");
+    unlink(kScreenshot.c_str());
+}
+
 TEST(ConsoleTool, ProgramEndsWithTheTool)
 {
     // The tool hands on a request to end; its sudden death takes the program along.

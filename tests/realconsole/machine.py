@@ -22,6 +22,13 @@ from initramfs import Initramfs, MissingPart
 # The boot loader's number of the 1024x768 mode with so many bits a pixel.
 VGA_MODES = {8: 0x305, 15: 0x316, 16: 0x317, 24: 0x318, 32: 0x344}
 
+# Linux has the PC's numbers for the keys up to F12, and its own for those that the PC numbers from 0x80 up:
+# KP_ENTER to right ALT, HOME to DELETE, PAUSE, and the last three of META and COMPOSE.
+LAST_PLAIN_KEY = 88
+FURTHER_KEYS = dict(enumerate((0x9C, 0x9D, 0xB5, 0xB7, 0xB8), 96))
+FURTHER_KEYS |= dict(enumerate((0xC7, 0xC8, 0xC9, 0xCB, 0xCD, 0xCF, 0xD0, 0xD1, 0xD2, 0xD3), 102))
+FURTHER_KEYS |= {119: 0xC6, 125: 0xDB, 126: 0xDC, 127: 0xDD}
+
 BOOT_SECONDS = 60
 ANSWER_SECONDS = 20
 
@@ -41,7 +48,7 @@ def boot(bits: int, programs: list[Path], kernel_folder: Path, work_folder: Path
         raise MissingPart(f"{kernel} is missing: run scripts/fetch-kernel (Debian package linux-image-amd64)")
     work_folder.mkdir(parents=True, exist_ok=True)
     archive = work_folder / "initramfs.cpio"
-    _make_initramfs(programs).write(archive)
+    _make_initramfs(programs, kernel_folder / "modules").write(archive)
 
     machine = Machine(work_folder)
     try:
@@ -113,6 +120,13 @@ class Machine:
     def monitor(self, command: str) -> str:
         """Gives the emulator's monitor a line like "sendkey a" or "mouse_move 10 5"; returns its answer."""
         return self._qmp("human-monitor-command", {"command-line": command})
+
+    def key(self, byte: int) -> None:
+        """Presses the key with this code of Linux, or lets it go if bit 7 is set."""
+        code = byte & 0x7F
+        key = {"type": "number", "data": code if code <= LAST_PLAIN_KEY else FURTHER_KEYS[code]}
+        event = {"type": "key", "data": {"down": byte <= 0x7F, "key": key}}
+        self._qmp("input-send-event", {"events": [event]})
 
     def screenshot(self) -> picture.Picture:
         self._qmp("screendump", {"filename": str(self._screendump)})
@@ -186,7 +200,7 @@ class Machine:
         return f"the emulator ended with status {self._emulator.returncode}: {reason}"
 
 
-def _make_initramfs(programs: list[Path]) -> Initramfs:
+def _make_initramfs(programs: list[Path], modules: Path) -> Initramfs:
     busybox = Path(_tool("busybox", "busybox-static"))
     guest = Initramfs()
     for folder in ("bin", "dev", "proc", "sys", "tmp"):
@@ -194,6 +208,7 @@ def _make_initramfs(programs: list[Path]) -> Initramfs:
     guest.add_program(busybox)
     guest.add_file("/bin/busybox", busybox)
     guest.add_file("/init", Path(__file__).with_name("init"))
+    guest.add_file("/mouse.ko", modules / "kernel/drivers/input/mouse/psmouse.ko")
     for program in programs:
         guest.add_program(program)
     return guest

@@ -1,12 +1,14 @@
 """Runs programs on a real framebuffer console and on the virtual console: both must show the same screen."""
 
 import argparse
+import shutil
 import subprocess
 import sys
 from pathlib import Path
 
 import machine
 import picture
+import script
 
 VIRTUAL_SECONDS = 60
 
@@ -18,12 +20,16 @@ class Difference(Exception):
 def main() -> int:
     options = parse_options()
     try:
-        programs = [options.example, options.pattern]
+        programs = [options.example, options.pattern, *(program for program, _ in options.play)]
         with machine.boot(options.bits, programs, options.kernel, options.keep) as real:
             # The example first: it is to meet the screen as the kernel leaves it.
             compare_program(real, options, options.example)
             compare_program(real, options, options.pattern)
-    except (Difference, machine.MachineError, machine.MissingPart, ValueError, OSError) as error:
+            for program, path in options.play:
+                compare_script(real, options, program, path)
+    except (
+        Difference, machine.MachineError, machine.MissingPart, script.ScriptError, ValueError, OSError
+    ) as error:
         print(f"realconsole.{options.bits}: {error}", file=sys.stderr)
         return 1
     return 0
@@ -34,6 +40,10 @@ def parse_options() -> argparse.Namespace:
     parser.add_argument("--bits", type=int, required=True, choices=sorted(machine.VGA_MODES))
     parser.add_argument("--example", type=Path, required=True, help="holds its picture with --hold")
     parser.add_argument("--pattern", type=Path, required=True, help="the same, and tells of the device")
+    parser.add_argument(
+        "--play", type=Path, nargs=2, action="append", default=[], metavar=("PROGRAM", "SCRIPT"),
+        help="both consoles' users follow the script; may be repeated",
+    )
     parser.add_argument("--console", type=Path, required=True, help="the virtual console")
     parser.add_argument("--kernel", type=Path, required=True, help="what scripts/fetch-kernel left")
     parser.add_argument("--keep", type=Path, required=True, help="the folder for pictures and logs")
@@ -58,22 +68,49 @@ def compare_program(real: machine.Machine, options: argparse.Namespace, program:
     compare_screens(real_screen, virtual_screen, stem)
 
 
+def compare_script(real: machine.Machine, options: argparse.Namespace, program: Path, path: Path) -> None:
+    """The program writes the same, and shows the same at each of the script's screenshots."""
+    steps = script.read_steps(options.console, path)
+    names = [step.split()[1] for step in steps if step.startswith("screenshot ")]
+    real_folder, virtual_folder = (options.keep / program.name / kind for kind in ("real", "virtual"))
+    for folder in (real_folder, virtual_folder):
+        shutil.rmtree(folder, ignore_errors=True)
+        folder.mkdir(parents=True)
+    virtual_words = run_virtually(options, program, ["--script", path], virtual_folder)
+    real_words = script.Player(real, real_folder).play(steps, program)
+    if virtual_words != real_words:
+        for folder, words in ((real_folder, real_words), (virtual_folder, virtual_words)):
+            folder.with_suffix(".txt").write_text("\n".join(words), encoding="utf-8")
+        raise Difference(f"{program.name} wrote what differs: see the .txt in {real_folder.parent}")
+    for name in names:
+        screens = (picture.read_png(folder / name) for folder in (real_folder, virtual_folder))
+        compare_screens(*screens, real_folder.parent / Path(name).stem)
+
+
 def run_on_virtual_console(
     options: argparse.Namespace, program: Path, screenshot: Path
 ) -> tuple[list[str], picture.Picture]:
     screenshot.unlink(missing_ok=True)
-    mode = f"1024x768x{options.bits}"
-    command = [options.console, "--mode", mode, "--screenshot", screenshot, "--", program]
+    words = run_virtually(options, program, ["--screenshot", screenshot])
+    return words, picture.read_png(screenshot)
+
+
+def run_virtually(
+    options: argparse.Namespace, program: Path, further: list, folder: Path | None = None
+) -> list[str]:
+    command = [options.console, "--mode", f"1024x768x{options.bits}", *further, "--", program]
     try:
-        result = subprocess.run(command, capture_output=True, text=True, timeout=VIRTUAL_SECONDS, check=False)
+        result = subprocess.run(
+            command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True, cwd=folder,
+            timeout=VIRTUAL_SECONDS, check=False,
+        )
     except subprocess.TimeoutExpired:
         raise Difference(f"{program.name} does not end on the virtual console") from None
     if result.returncode != 0:
         raise Difference(
-            f"{program.name} ended with status {result.returncode} on the virtual console: "
-            + (result.stdout + result.stderr).strip()
+            f"{program.name} ended with status {result.returncode} on the virtual console: {result.stdout}"
         )
-    return result.stdout.splitlines(), picture.read_png(screenshot)
+    return result.stdout.splitlines()
 
 
 def compare_screens(real: picture.Picture, virtual: picture.Picture, stem: Path) -> None:

@@ -1,0 +1,206 @@
+#include <console/script_player.h>
+
+#include <csignal>
+#include <exception>
+#include <utility>
+
+#include <sys/eventfd.h>
+
+namespace console {
+
+namespace {
+
+using std::chrono::milliseconds;
+
+constexpr milliseconds kReadyLimit{10000};  // for the program to get ready for a step
+constexpr milliseconds kReadLimit{100};     // to read a report; what takes longer is left in the device
+// The program is through with what it has to say to the mouse if it says no more for so long. If it hasn't
+// turned on the wheel yet, that is probably still to come.
+constexpr milliseconds kHandshakePause{50};
+constexpr milliseconds kPlainPause{500};
+constexpr milliseconds kPollInterval{2};
+constexpr milliseconds kPictureInterval{20};
+constexpr milliseconds kKillDelay{5000};  // to end when asked to
+
+constexpr char const* kEndedBefore = "the program ended before this was done";
+
+std::string Milliseconds(milliseconds time) { return std::to_string(time.count()) + " ms"; }
+
+}
+
+ScriptPlayer::ScriptPlayer(VirtualConsole& onConsole, Script const& toPlay)
+    : console(onConsole), script(toPlay),
+      signalFd(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK), "starting the script"),
+      thread([this](std::stop_token const& token) {
+          stop = token;
+          Play();
+      })
+{}
+
+int ScriptPlayer::TakeSignal()
+{
+    eventfd_t count = 0;
+    eventfd_read(signalFd.Get(), &count);
+    return signalToSend.exchange(0);
+}
+
+std::string ScriptPlayer::Stop()
+{
+    thread.request_stop();
+    if (thread.joinable()) thread.join();
+    return problem;
+}
+
+void ScriptPlayer::Play()
+{
+    try {
+        problem = PlaySteps();
+    } catch (std::exception const& error) {
+        problem = script.name + ": failed: " + error.what();
+    }
+    if (!problem.empty()) EndProgram();
+}
+
+ScriptPlayer::Problem ScriptPlayer::PlaySteps()
+{
+    for (auto const& step : script.steps) {
+        bool const tooLate = stop.stop_requested() && !std::holds_alternative<Quit>(step.action);
+        auto const what = tooLate
+            ? kEndedBefore
+            : std::visit([this](auto const& action) { return Do(action); }, step.action);
+        if (!what.empty()) return AtLine(script.name, step.line, what);
+    }
+    return {};
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(MouseReport const& report)
+{
+    if (!mouseReady) {
+        auto spokenTo = Clock::now();
+        auto const isQuiet = [&] {
+            if (!console.IsMouseRead()) spokenTo = Clock::now();
+            bool const plain = console.Mouse().protocol == MouseProtocol::Plain;
+            return Clock::now() - spokenTo >= (plain ? kPlainPause : kHandshakePause);
+        };
+        if (auto what = Need(isQuiet, "opened the mouse and read its answers"); !what.empty()) return what;
+        mouseReady = true;
+    }
+    if (!console.MoveMouse(report.dx, report.dy, report.wheel, report.buttons))
+        return "the program reads the mouse so slowly that this was lost";
+    Await([this] { return console.IsMouseRead(); }, kReadLimit, kPollInterval);
+    return {};
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(KeyByte const& key)
+{
+    auto const areRead = [this] { return console.AreKeysRead(); };
+    if (!keysReady) {
+        if (auto what = Need(areRead, "put the keyboard into medium raw mode"); !what.empty()) return what;
+        keysReady = true;
+    }
+    if (console.Tty().activeConsole != TtyState::kOwnConsole) return {};  // goes to the one that is shown
+    if (!console.TypeKeys({&key.code, 1}))
+        return "the program reads the keyboard so slowly that this was lost";
+    Await(areRead, kReadLimit, kPollInterval);
+    return {};
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(Pause const& pause)
+{
+    return Sleep(pause.time) ? Problem() : kEndedBefore;
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(Settle const& settle)
+{
+    if (auto what = NeedScreen(); !what.empty()) return what;
+    auto shown = console.Screen();
+    auto since = Clock::now();
+    auto const isQuiet = [&] {
+        if (auto now = console.Screen(); now.bytes != shown.bytes) {
+            shown = std::move(now);
+            since = Clock::now();
+        }
+        return Clock::now() - since >= settle.quiet;
+    };
+    switch (Await(isQuiet, settle.limit, kPictureInterval)) {
+    case Outcome::Met: return {};
+    case Outcome::Stopped: return kEndedBefore;
+    default:
+        return "the screen did not stand still for " + Milliseconds(settle.quiet) + " within " +
+            Milliseconds(settle.limit);
+    }
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(Screenshot const& shot)
+{
+    if (auto what = NeedScreen(); !what.empty()) return what;
+    auto const why = SavePicture(console.Screen(), shot.path);
+    return why.empty() ? why : "cannot write " + shot.path + ": " + why;
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(ConsoleSwitch const& to)
+{
+    auto const takesPart = [this] { return console.Tty().vtMode.mode == VT_PROCESS; };
+    if (auto what = Need(takesPart, "asked to be told of console switches"); !what.empty()) return what;
+    auto const isThere = [&] { return console.Tty().activeConsole == static_cast<int>(to.console); };
+    if (isThere()) return {};
+    auto const answers = console.Count(Request::ReleaseDisplay);
+    console.SwitchTo(to.console);
+    auto what = Need(isThere, "let the console be switched");
+    // It is told of its return, too, and is to have noticed.
+    Await([&] { return console.Count(Request::ReleaseDisplay) != answers; }, kReadLimit, kPollInterval);
+    return what;
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(Quit const&)
+{
+    EndProgram();
+    return {};
+}
+
+ScriptPlayer::Problem ScriptPlayer::NeedScreen()
+{
+    return Need([this] { return console.Count(Request::MapMemory) != 0; }, "mapped the framebuffer");
+}
+
+template <class Condition>
+ScriptPlayer::Problem ScriptPlayer::Need(Condition isMet, char const* otherwise)
+{
+    switch (Await(isMet, kReadyLimit, kPollInterval)) {
+    case Outcome::Met: return {};
+    case Outcome::Stopped: return kEndedBefore;
+    default: return std::string("the program has not ") + otherwise + " within " + Milliseconds(kReadyLimit);
+    }
+}
+
+template <class Condition>
+ScriptPlayer::Outcome ScriptPlayer::Await(Condition isMet, milliseconds limit, milliseconds interval)
+{
+    auto const deadline = Clock::now() + limit;
+    while (!isMet()) {
+        if (Clock::now() >= deadline) return Outcome::TooLate;
+        if (!Sleep(interval)) return Outcome::Stopped;
+    }
+    return Outcome::Met;
+}
+
+bool ScriptPlayer::Sleep(milliseconds time)
+{
+    std::unique_lock lock(sleepMutex);
+    sleeper.wait_for(lock, stop, time, [] { return false; });
+    return !stop.stop_requested();
+}
+
+void ScriptPlayer::EndProgram()
+{
+    Ask(SIGTERM);
+    if (Sleep(kKillDelay)) Ask(SIGKILL);
+}
+
+void ScriptPlayer::Ask(int signal)
+{
+    signalToSend = signal;
+    eventfd_write(signalFd.Get(), 1);
+}
+
+}

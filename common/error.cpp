@@ -5,6 +5,7 @@
 
 #include <array>
 #include <atomic>
+#include <cstddef>
 #include <cstring>
 #include <new>
 #include <string_view>
@@ -21,7 +22,9 @@ ErrorInfo* CloneBytes(ErrorInfo const* info, std::size_t size)
 {
     unsigned char* const memory = NewRecordArray(size);
     if (memory == nullptr) return nullptr;
-    std::memcpy(memory, static_cast<void const*>(info), size);
+    // All but the count, which may be changing.
+    constexpr std::size_t kCopied = offsetof(ErrorInfo, code);
+    std::memcpy(memory + kCopied, reinterpret_cast<unsigned char const*>(info) + kCopied, size - kCopied);
     auto* const clone = reinterpret_cast<ErrorInfo*>(memory);
     clone->refs = 1;
     clone->reason = nullptr;

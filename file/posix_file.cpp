@@ -42,7 +42,7 @@ void posix_file::Read(void* buffer, std::uint64_t size, std::uint64_t& count)
         if (got > 0)
             count += static_cast<std::uint64_t>(got);
         else if (errno != EINTR)
-            error = Failure(Common::ErrorReadFailed, MessageReadFailed, LocationOf(kFile, "Read", 47));
+            error = Failure(Common::ErrorReadFailed, MessageReadFailed, LocationOf(kFile, "Read", __LINE__));
     }
 }
 
@@ -60,7 +60,7 @@ std::uint64_t posix_file::Move(std::int64_t distance, int whence)
     if (error) return 0;
     off_t const position = lseek(descriptor, distance, whence);
     if (position == -1) {
-        error = Failure(Common::ErrorSeekFailed, MessageSeekFailed, LocationOf(kFile, "Move", 66));
+        error = Failure(Common::ErrorSeekFailed, MessageSeekFailed, LocationOf(kFile, "Move", __LINE__));
         return 0;
     }
     return static_cast<std::uint64_t>(position);

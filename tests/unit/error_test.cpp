@@ -6,6 +6,7 @@
 #include <support/chain_bytes.h>
 #include <support/child_process.h>
 
+#include <atomic>
 #include <gtest/gtest.h>
 #include <new>
 #include <random>
@@ -13,7 +14,7 @@
 
 using namespace Common;
 
-static int allocationsLeft = -1;  // no limit
+static std::atomic<int> allocationsLeft = -1;  // no limit
 
 void* operator new[](std::size_t size, std::nothrow_t const& /*tag*/) noexcept
 {

@@ -19,18 +19,15 @@ struct Folder {
     ~Folder() { std::filesystem::remove_all(name); }
 };
 
-struct Failed {
-    unsigned code;
-    std::uint32_t line;
-    unsigned reason;
-    bool operator==(Failed const&) const = default;
-};
+/// Code, place, and the system's reason or else the line.
+using Failure = std::tuple<unsigned, std::string, unsigned>;
 
-Failed FailureOf(file_object const& file)
+Failure FailureOf(file_object const& file)
 {
     auto const* const info = file.error.info;
     if (info == nullptr) return {};
-    return {info->code, info->line, info->reason != nullptr ? info->reason->number : 0};
+    std::string const place = info->file + (':' + std::string(info->function));
+    return {info->code, place, info->reason != nullptr ? info->reason->number : info->line};
 }
 
 }
@@ -73,25 +70,25 @@ TEST(PosixFile, ReadsUntilItsFirstErrorAndThenStandsStill)
     ReadAll(*file, text + 4, 6);
     file->Read(text, 1, count);
     EXPECT_EQ(count, 0);
-    EXPECT_EQ(FailureOf(*file), Failed());
+    EXPECT_EQ(FailureOf(*file), Failure());
     file->Rewind();
     ReadAll(*file, text + 10, 20);
     EXPECT_STREQ(text, "01234567890123456789");
-    EXPECT_EQ(FailureOf(*file), (Failed{0x40002, 27, 0}));
+    EXPECT_EQ(FailureOf(*file), Failure(0x40002, "include/file/file:Read", 27));
     EXPECT_FALSE(file->IOCTL(0, nullptr));
     file->Rewind();
     file->Read(text, 1, count);
     EXPECT_EQ(std::tuple(count, file->Size()), std::tuple(0, 0));
-    EXPECT_EQ(FailureOf(*file), (Failed{0x40002, 27, 0}));
+    EXPECT_EQ(FailureOf(*file), Failure(0x40002, "include/file/file:Read", 27));
 
     // Nothing is mapped at address 0, and negative positions are for devices.
     auto const memory = dir.Open(u"/proc/self/mem", 0);
     ReadAll(*memory, text, 1);
-    EXPECT_EQ(FailureOf(*memory), (Failed{0x40001, 47, EIO}));
+    EXPECT_EQ(FailureOf(*memory), Failure(0x40001, "file/posix_file:Read", EIO));
     auto const sought = dir.Open(u"digits", 0);
     EXPECT_EQ(dynamic_cast<raccess_file&>(*sought).SeekEnd(-11), 0);
-    EXPECT_EQ(FailureOf(*sought), (Failed{0x40005, 66, EINVAL}));
+    EXPECT_EQ(FailureOf(*sought), Failure(0x40005, "file/posix_file:Move", EINVAL));
     auto const device = dir.Open(u"digits", 0);
     EXPECT_FALSE(device->IOCTL(0, nullptr));
-    EXPECT_EQ(FailureOf(*device), (Failed{0x4000E, 28, 0}));
+    EXPECT_EQ(FailureOf(*device), Failure(0x4000E, "common/file_object:IOCTL", 28));
 }

@@ -71,8 +71,8 @@ struct ErrorOps {
 void Release(ErrorInfo* info);
 
 /// A handle to a chain of records, from the failure as the caller saw it down to its reason. Handles to one
-/// chain may be copied and dropped on several threads; one handle belongs to one thread at a time. Nothing here
-/// throws, and with no memory left the handle holds a static record that says so.
+/// chain may be copied and dropped on several threads; one handle belongs to one thread at a time. Nothing
+/// here throws, and with no memory left the handle holds a static record that says so.
 class Error {
 public:
     /// Success.

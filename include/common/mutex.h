@@ -4,8 +4,8 @@
 
 namespace Common {
 
-/// A lock that reports the thread which releases what it does not hold. For std::lock_guard and its like. There is
-/// nothing to destroy, so a global one serves until the last thread is gone.
+/// A lock that reports the thread which releases what it does not hold. For std::lock_guard and its like.
+/// There is nothing to destroy, so a global one serves until the last thread is gone.
 class Mutex {
 public:
     constexpr Mutex() = default;

@@ -9,8 +9,8 @@ class si_file;
 /// A folder of the system.
 class posix_dir {
 public:
-    /// Opens the file of this name for reading; `flags` must be 0. A path starts from this folder, unless it is
-    /// absolute. Null if there is no such file, or it is not a regular one.
+    /// Opens the file of this name for reading; `flags` must be 0. A path starts from this folder, unless
+    /// it is absolute. Null if there is no such file, or it is not a regular one.
     virtual std::unique_ptr<si_file> Open(std::u16string_view name, unsigned flags);
 
     explicit posix_dir(std::string folder) : path(std::move(folder)) {}

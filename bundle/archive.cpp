@@ -17,8 +17,8 @@ struct CloseStdio {
     void operator()(std::FILE* file) const { std::fclose(file); }
 };
 
-/// Null if there is no archive in the file. The result owns the file.
-zip_t* OpenZip(std::string const& path)
+/// Null if there is no archive in the file. The result owns the file. `size` gets the size of the archive.
+zip_t* OpenZip(std::string const& path, std::uint64_t& size)
 {
     std::unique_ptr<std::FILE, CloseStdio> file(std::fopen(path.c_str(), "rbe"));
     if (file == nullptr) return nullptr;
@@ -28,6 +28,7 @@ zip_t* OpenZip(std::string const& path)
         file.get(), section->offset, static_cast<zip_int64_t>(section->size), nullptr);
     if (source == nullptr) return nullptr;
     file.release();  // the source has it
+    size = section->size;
     zip_t* const zip = zip_open_from_source(source, ZIP_RDONLY, nullptr);
     if (zip == nullptr) zip_source_free(source);
     return zip;
@@ -47,12 +48,14 @@ std::string LoadText(zip_t* zip, ArchiveEntry const& entry)
 
 std::shared_ptr<Archive> Archive::Open(std::string path)
 {
-    zip_t* const zip = OpenZip(path);
+    std::uint64_t size = 0;
+    zip_t* const zip = OpenZip(path, size);
     if (zip == nullptr) return nullptr;
-    return std::shared_ptr<Archive>(new Archive(std::move(path), zip));
+    return std::shared_ptr<Archive>(new Archive(std::move(path), zip, size));
 }
 
-Archive::Archive(std::string filePath, zip_t* openZip) : path(std::move(filePath)), zip(openZip)
+Archive::Archive(std::string filePath, zip_t* openZip, std::uint64_t archiveSize)
+    : path(std::move(filePath)), zip(openZip), size(archiveSize)
 {
     if (auto const entry = FindExactly("locales")) locales = LoadText(zip, *entry);
 }
@@ -71,6 +74,7 @@ std::optional<ArchiveEntry> Archive::FindExactly(std::string name)
 {
     zip_stat_t status;
     bool const isFile = !name.empty() && !name.ends_with('/') && zip_stat(zip, name.c_str(), 0, &status) == 0;
-    if (!isFile || status.size / kMaxExpansion > status.comp_size) return std::nullopt;
+    if (!isFile || status.comp_size > size || status.size / kMaxExpansion > status.comp_size)
+        return std::nullopt;
     return ArchiveEntry{status.index, status.size, std::move(name)};
 }

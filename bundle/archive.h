@@ -34,8 +34,9 @@ public:
     zip_t* const zip;  ///< guarded by mutex, with all files that are open in it
 
 private:
-    Archive(std::string filePath, zip_t* openZip);
+    Archive(std::string filePath, zip_t* openZip, std::uint64_t archiveSize);
     std::optional<ArchiveEntry> FindExactly(std::string name);
 
-    std::string locales;  ///< does not change once the archive is open
+    std::uint64_t const size;  ///< of the archive, which no entry exceeds
+    std::string locales;       ///< does not change once the archive is open
 };

@@ -69,9 +69,10 @@ bool ArchiveFile::Read(void* buffer, unsigned size, unsigned& count)
     position += count;
     // The checksum is compared behind the data's end, where a reader who knows the size never comes.
     char beyond;
-    if (got >= 0 && position >= entry.size) got = zip_fread(stream, &beyond, 1) == 0 ? 0 : -1;
-    if (got >= 0) return true;
-    SetFailure(Common::ErrorReadFailed, zip_file_strerror(stream), LocationOf(kFile, "Read", __LINE__));
+    if (got > 0 && position >= entry.size) got = zip_fread(stream, &beyond, 1);
+    if (got > 0 ? position < entry.size : got == 0 && position == entry.size) return true;
+    SetFailure(Common::ErrorReadFailed, got < 0 ? zip_file_strerror(stream) : "The data is not of its size",
+        LocationOf(kFile, "Read", __LINE__));
     return false;
 }
 

@@ -27,7 +27,7 @@ zip_t* OpenZip(std::string const& path, std::uint64_t& size)
     zip_source_t* const source = zip_source_filep_create(
         file.get(), section->offset, static_cast<zip_int64_t>(section->size), nullptr);
     if (source == nullptr) return nullptr;
-    file.release();  // the source has it
+    static_cast<void>(file.release());  // the source has it
     size = section->size;
     zip_t* const zip = zip_open_from_source(source, ZIP_RDONLY, nullptr);
     if (zip == nullptr) zip_source_free(source);

@@ -5,6 +5,7 @@
 
 #include <array>
 #include <atomic>
+#include <bit>
 #include <cstddef>
 #include <cstring>
 #include <new>
@@ -102,7 +103,7 @@ ErrorInfo* NewTextRecord(unsigned code, unsigned short const* message, Location 
     if (info == &outOfMemory) return info;
     auto* const record = static_cast<TextRecord*>(info);
     if (copied == 0) {
-        record->message = reinterpret_cast<std::uintptr_t>(message);
+        record->message = std::bit_cast<std::uint64_t>(message);
     } else {
         record->message = sizeof(TextRecord);
         std::memcpy(record + 1, message, copied);
@@ -123,7 +124,7 @@ void GetTextMessage(ErrorInfo const* info, std::u16string& out)
     std::uint64_t const message = static_cast<TextRecord const*>(info)->message;
     auto const* text = message < info->size
         ? reinterpret_cast<unsigned short const*>(reinterpret_cast<unsigned char const*>(info) + message)
-        : reinterpret_cast<unsigned short const*>(message);
+        : std::bit_cast<unsigned short const*>(message);
     for (out.clear(); *text != 0; ++text)
         out += static_cast<char16_t>(*text);
 }

@@ -63,7 +63,7 @@ public:
     void Finish()
     {
         if (zip_close(zip.get()) != 0) Fail("the archive");
-        zip.release();
+        static_cast<void>(zip.release());  // closed with it
     }
 
 private:

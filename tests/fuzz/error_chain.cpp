@@ -2,7 +2,6 @@
 #include <common/error.h>
 
 #include <cstring>
-#include <vector>
 
 extern "C" int LLVMFuzzerTestOneInput(unsigned char const* data, std::size_t size)
 {
@@ -15,11 +14,9 @@ extern "C" int LLVMFuzzerTestOneInput(unsigned char const* data, std::size_t siz
         for (char* name = std::strtok(names.data(), ","); name != nullptr; name = std::strtok(nullptr, ",")) {
             read += info->ops->GetNumber(info, name) != 0;
             if (char const* const ascii = info->ops->GetAscii(info, name)) read += std::strlen(ascii);
-            for (auto const* wide = info->ops->GetWide(info, name); wide != nullptr && *wide != 0; ++wide)
-                ++read;
+            auto const* const wide = reinterpret_cast<char16_t const*>(info->ops->GetWide(info, name));
+            if (wide != nullptr) read += std::u16string_view(wide).size();
         }
-        for (char const* const place : {info->file, info->function})
-            read += place != nullptr ? std::strlen(place) : 0;
         Common::Release(info->ops->Clone(info));
     }
     // A code, a site and the ends of the message and of the parameters. Nobody reads what does not count.

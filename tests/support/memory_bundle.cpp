@@ -2,7 +2,7 @@
 
 #include <common/bundle_api.h>
 
-#include <algorithm>
+#include <cstdio>
 #include <cstring>
 
 MemoryBundle memoryBundle;
@@ -11,18 +11,21 @@ namespace BundleApi {
 
 struct ModuleHandle {};
 struct FileHandle {
-    std::string data;
-    std::size_t position;
+    std::string_view rest = "data";
 };
+
+static unsigned char* NewCopy(std::string_view data, unsigned* size)
+{
+    *size = static_cast<unsigned>(data.size());
+    return static_cast<unsigned char*>(std::memcpy(new unsigned char[data.size()], data.data(), data.size()));
+}
 
 ModuleHandle* OpenModule(unsigned short const* path)
 {
     if (path == nullptr || !memoryBundle.hasArchive) return nullptr;
-    std::lock_guard const lock(memoryBundle.mutex);
-    memoryBundle.path.clear();
-    while (*path != 0)
-        memoryBundle.path += static_cast<char16_t>(*path++);
-    ++memoryBundle.modules;
+    if (memoryBundle.modules++ == 0)
+        while (*path != 0)
+            memoryBundle.path += static_cast<char16_t>(*path++);
     return new ModuleHandle;
 }
 
@@ -34,48 +37,29 @@ void CloseModule(ModuleHandle* module)
 
 FileHandle* OpenFile(ModuleHandle* module, char const* name, char const* /*variant*/)
 {
-    if (module == nullptr || !memoryBundle.files.contains(name)) return nullptr;
-    ++memoryBundle.openFiles;
-    return new FileHandle{memoryBundle.files[name], 0};
+    return module != nullptr && *name == 'f' ? ++memoryBundle.openFiles, new FileHandle : nullptr;
 }
 
-unsigned char* LoadFile(ModuleHandle* module, char const* name, char const* /*variant*/, unsigned* size)
+unsigned char* LoadFile(ModuleHandle* module, char const* /*name*/, char const* /*variant*/, unsigned* size)
 {
-    if (module == nullptr || !memoryBundle.files.contains(name)) return nullptr;
-    std::string const& data = memoryBundle.files[name];
-    *size = static_cast<unsigned>(data.size());
-    return static_cast<unsigned char*>(std::memcpy(new unsigned char[*size], data.data(), *size));
+    return module != nullptr ? NewCopy("data", size) : nullptr;
 }
 
 bool ReadFile(FileHandle* file, void* buffer, unsigned size, unsigned* read)
 {
-    ++memoryBundle.calls;
-    *read = static_cast<unsigned>(
-        file->data.copy(static_cast<char*>(buffer), memoryBundle.failing ? 1 : size, file->position));
-    file->position += *read;
-    return !memoryBundle.failing;
+    *read =
+        static_cast<unsigned>(file->rest.copy(static_cast<char*>(buffer), memoryBundle.failing ? 1 : size));
+    file->rest.remove_prefix(*read);
+    return memoryBundle.Call();
 }
 
-bool GetFileSize(FileHandle* file, unsigned long long* size)
-{
-    ++memoryBundle.calls;
-    *size = file->data.size();
-    return !memoryBundle.failing;
-}
+bool GetFileSize(FileHandle* /*file*/, unsigned long long* size) { return *size = 4, memoryBundle.Call(); }
 
-bool RewindFile(FileHandle* file)
-{
-    ++memoryBundle.calls;
-    file->position = 0;
-    return !memoryBundle.failing;
-}
+bool RewindFile(FileHandle* file) { return *file = {}, memoryBundle.Call(); }
 
 unsigned char* GetFileError(FileHandle* /*file*/, unsigned* size)
 {
-    *size = static_cast<unsigned>(memoryBundle.failure.size());
-    if (*size == 0) return nullptr;
-    return static_cast<unsigned char*>(
-        std::memcpy(new unsigned char[*size], memoryBundle.failure.data(), *size));
+    return memoryBundle.failure.empty() ? nullptr : NewCopy(memoryBundle.failure, size);
 }
 
 void CloseFile(FileHandle* file)

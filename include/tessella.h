@@ -3,9 +3,11 @@
 /// Everything that the library offers to applications.
 #include <tessella/color.h>
 #include <tessella/context.h>
+#include <tessella/event.h>
 #include <tessella/export.h>
 #include <tessella/image.h>
 #include <tessella/region.h>
 #include <tessella/screen.h>
 #include <tessella/session.h>
 #include <tessella/types.h>
+#include <tessella/window.h>

@@ -1,10 +1,12 @@
 #include <tessella/framebuffer_l.h>
 
+#include <tessella/mouse.h>
 #include <tessella/screen.h>
 #include <tessella/screen_guard.h>
 #include <tessella/session_state.h>
 #include <tessella/video_mode.h>
 #include <tessella/whole_screen.h>
+#include <tessella/window.h>
 
 #include <fcntl.h>
 #include <linux/fb.h>
@@ -12,6 +14,7 @@
 #include <sys/mman.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <cstdio>
 
 namespace {
@@ -93,8 +96,9 @@ bool GrSetVideoMode(unsigned& width, unsigned& height, unsigned& depth, unsigned
     GrScreen.bytesPerPixel = bits / 8;
     GrScreen.stride = fixed.line_length;
     GrScreen.fbLength = fixed.smem_len;
-    GrScreen.width = variable.xres;
-    GrScreen.height = variable.yres;
+    // The mouse's thread keeps the pointer within these.
+    std::atomic_ref(GrScreen.width).store(variable.xres, std::memory_order_relaxed);
+    std::atomic_ref(GrScreen.height).store(variable.yres, std::memory_order_relaxed);
     MapFramebuffer();
 
     unsigned const colorBits = variable.red.length + variable.green.length + variable.blue.length;
@@ -117,6 +121,8 @@ bool GrSetVideoMode(unsigned& width, unsigned& height, unsigned& depth, unsigned
     width = GrScreen.width;
     height = GrScreen.height;
     depth = GrScreen.depth;
+    GrWindow::OnVideoModeChanged();
+    GrMouseRecentre();
     return true;
 }
 

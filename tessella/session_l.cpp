@@ -2,9 +2,11 @@
 
 #include <tessella/event_wait_l.h>
 #include <tessella/framebuffer_l.h>
+#include <tessella/mouse.h>
 #include <tessella/session_state.h>
 #include <tessella/vga_l.h>
 #include <tessella/whole_screen.h>
+#include <tessella/window.h>
 
 #include <csignal>
 #include <cstdio>
@@ -16,12 +18,10 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     sessionThread = pthread_self();
     if (!OpenFramebuffer()) return false;
     RequestVgaPorts();
-    CreateEventWait();
-    if (!GrSetVideoMode(width, height, depth, mode)) {
-        DestroyEventWait();
-        return false;
-    }
+    if (!GrSetVideoMode(width, height, depth, mode)) return false;
     screenVisible = true;
+    GrMouseStart();
+    GrWindow::InitWindows();
     signal(SIGUSR1, [](int) {});  // harmless from now on, whoever sends it
     grabMutex.lock();
     initialized = true;
@@ -33,10 +33,11 @@ void GrDone()
 {
     if (!initialized) return;
     ClearScreen();
+    GrMouseStop();
+    GrWindow::ShutdownWindows();
     DeleteScreenContext();
     CloseFramebuffer();
     grabMutex.unlock();
-    DestroyEventWait();
     initialized = false;
 }
 

@@ -1,5 +1,4 @@
-#include <console/virtual_console.h>
-#include <support/child_process.h>
+#include <support/on_console.h>
 #include <tessella.h>
 #include <tessella/event_wait_l.h>
 #include <tessella/screen_guard.h>
@@ -26,30 +25,6 @@
 namespace {
 
 using console::Request;
-
-struct Sizes {
-    unsigned width = 1, height = 2, depth = 3;
-
-    bool operator==(Sizes const&) const = default;
-};
-
-bool Init(Sizes& sizes) { return GrInit(sizes.width, sizes.height, sizes.depth, 0); }
-
-/// Runs `body` on a console of its own; what it expects is reported by the parent.
-template <typename Body>
-ChildOutcome OnConsole(char const* mode, char const* format, Body body)
-{
-    ChildOutcome outcome = RunChild([&] {
-        console::Setup setup{*console::ParseMode(mode), {}, {}};
-        if (format) setup.format = console::ParseFormat(format);
-        console::VirtualConsole screen(setup);
-        screen.AttachProcess();
-        body(screen);
-        return testing::Test::HasFailure() ? 1 : 0;
-    });
-    EXPECT_EQ(outcome.status, 0) << outcome.out;
-    return outcome;
-}
 
 bool IsOpen(int fd) { return fcntl(fd, F_GETFD) != -1; }
 

@@ -7,6 +7,9 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+/// There only with the address sanitizer, which looks for leaks when a process ends, but not by `_exit`.
+extern "C" [[gnu::weak]] int __lsan_do_recoverable_leak_check();
+
 /// What a child process wrote, and how it ended.
 struct ChildOutcome {
     std::string out;
@@ -33,7 +36,8 @@ ChildOutcome RunChild(Body body, Parent parent)
     if (child == 0) {
         dup2(out, STDOUT_FILENO);
         dup2(err, STDERR_FILENO);
-        int const result = body();
+        int result = body();
+        if (__lsan_do_recoverable_leak_check && __lsan_do_recoverable_leak_check() != 0) result = 99;
         std::fflush(stdout);
         _exit(result);
     }

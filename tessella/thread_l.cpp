@@ -1,0 +1,42 @@
+#include <tessella/thread_l.h>
+
+#include <csignal>
+
+#include <poll.h>
+#include <unistd.h>
+
+bool InputThread::Start(void* (*body)(void*), void* argument)
+{
+    sigset_t all, before;
+    sigfillset(&all);
+    pthread_sigmask(SIG_SETMASK, &all, &before);
+    if (pipe(stopPipe.data()) == 0) {
+        started = pthread_create(&thread, nullptr, body, argument) == 0;
+        if (!started)
+            for (int& end : stopPipe)
+                close(end);
+    }
+    pthread_sigmask(SIG_SETMASK, &before, nullptr);
+    return started;
+}
+
+void InputThread::Stop()
+{
+    static constexpr char kStop[4]{};
+    if (write(stopPipe[1], kStop, sizeof kStop) == sizeof kStop) pthread_join(thread, nullptr);
+    for (int const end : stopPipe)
+        close(end);
+}
+
+bool InputThread::WaitForInput(int device) const
+{
+    pollfd waiting[] = {{stopPipe[0], POLLIN, 0}, {device, POLLIN, 0}};
+    for (;;) {
+        poll(waiting, 2, -1);
+        if (waiting[0].revents & POLLIN) return false;
+        if (waiting[1].revents & POLLIN) return true;
+        // A device that is gone would have poll return at once for ever; a negative descriptor is passed
+        // over.
+        if (waiting[1].revents & (POLLERR | POLLHUP | POLLNVAL)) waiting[1].fd = -1;
+    }
+}

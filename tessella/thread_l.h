@@ -1,0 +1,27 @@
+#pragma once
+
+#include <array>
+
+#include <pthread.h>
+
+/// A thread that waits for a device, and the pipe that ends it. Signals are for the application: input
+/// threads run with all of them blocked.
+class InputThread {
+public:
+    /// Runs `body` with `argument` on a thread of its own. False if the system refuses a pipe or a thread.
+    bool Start(void* (*body)(void*), void* argument);
+
+    /// Tells the thread to end and waits until it has. Only once after a start.
+    void Stop();
+
+    /// True from the start on, for ever: there is one such thread a process.
+    bool WasStarted() const { return started; }
+
+    /// Waits until the device can be read; false if the thread is to end. On the thread itself.
+    bool WaitForInput(int device) const;
+
+private:
+    pthread_t thread{};
+    std::array<int, 2> stopPipe{-1, -1};  ///< the end that is read, the end that is written
+    bool started = false;
+};

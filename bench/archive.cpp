@@ -8,8 +8,8 @@
 #include <vector>
 #include <zip.h>
 
-// What a session reads of the library's archive when it starts, beside libzip reading the same from an archive
-// that is a file of its own. Both open it anew each time.
+// What a session reads of the library's archive when it starts, beside libzip reading the same from an
+// archive that is a file of its own. Both open it anew each time.
 
 namespace {
 

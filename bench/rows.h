@@ -16,6 +16,7 @@ inline constexpr char kPixman[] = "pixman";
 inline constexpr char kSdl[] = "SDL2";
 inline constexpr char kMemset[] = "memset";
 inline constexpr char kPlain[] = "plain loop";
+inline constexpr char kLibzip[] = "libzip";
 
 /// Has `contender` take part in `row`; `body` measures its loop over the state. table.py knows by the row's
 /// name what ratio is to be reached.

@@ -5,6 +5,9 @@ set(TESSELLA_PACKAGE_DIR ${CMAKE_INSTALL_LIBDIR}/cmake/tessella)
 
 install(TARGETS tessella EXPORT tessellaTargets
     LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR})
+# Found beside the library that needs it; nobody else links it.
+install(TARGETS tessella_bundle EXPORT tessellaTargets
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} NAMELINK_SKIP)
 install(FILES include/tessella.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR})
 install(DIRECTORY include/tessella DESTINATION ${CMAKE_INSTALL_INCLUDEDIR} FILES_MATCHING PATTERN "*.h")
 

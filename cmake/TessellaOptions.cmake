@@ -26,3 +26,6 @@ if(TESSELLA_SANITIZE)
     endif()
     add_link_options(-fsanitize=${TESSELLA_SANITIZE})
 endif()
+if(TESSELLA_FUZZ)
+    add_compile_options(-fsanitize=fuzzer-no-link)  # all code tells the fuzzer where it has been
+endif()

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <bundle/archive.h>
+#include <common/error.h>
+
+#include <memory>
+#include <string>
+
+/// A file of an archive, open for reading.
+class ArchiveFile {
+public:
+    /// Null if the file's data cannot be unpacked.
+    static std::unique_ptr<ArchiveFile> Open(std::shared_ptr<Archive> archive, ArchiveEntry entry);
+
+    ArchiveFile(ArchiveFile const&) = delete;
+    ArchiveFile& operator=(ArchiveFile const&) = delete;
+    ~ArchiveFile();
+
+    /// `count` gets how much was read, also if it is false that reading went well.
+    bool Read(void* buffer, unsigned size, unsigned& count);
+    bool Rewind();
+    std::uint64_t Size() const { return entry.size; }
+
+    /// The last failure as bytes of an error chain; empty if there was none.
+    std::string const& Failure() const { return failure; }
+
+private:
+    ArchiveFile(std::shared_ptr<Archive> from, ArchiveEntry what)
+        : archive(std::move(from)), entry(std::move(what))
+    {}
+    void CloseStream();
+    void SetFailure(std::uint32_t code, std::string_view message, Common::Location const& where);
+
+    std::shared_ptr<Archive> const archive;
+    ArchiveEntry const entry;
+    zip_file_t* stream = nullptr;  // guarded by the archive's mutex; null if rewinding has failed
+    std::uint64_t position = 0;
+    std::string failure;
+};

@@ -1,0 +1,19 @@
+#pragma once
+
+#include <common/error.h>
+
+namespace Common {
+
+/// The head of a record with a text.
+struct TextRecord : ErrorInfo {
+    std::uint64_t message;  ///< its offset from the record's start, or its address in a catalogue
+};
+
+/// Memory of a record; null if there is none.
+unsigned char* NewRecordArray(std::size_t size);
+
+void DestroyRecord(ErrorInfo* info);
+ErrorInfo* CloneRecord(ErrorInfo const* info);
+void GetTextMessage(ErrorInfo const* info, std::u16string& out);
+
+}

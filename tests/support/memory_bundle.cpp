@@ -1,0 +1,71 @@
+#include <support/memory_bundle.h>
+
+#include <common/bundle_api.h>
+
+#include <cstdio>
+#include <cstring>
+
+MemoryBundle memoryBundle;
+
+namespace BundleApi {
+
+struct ModuleHandle {};
+struct FileHandle {
+    std::string_view rest = "data";
+};
+
+static unsigned char* NewCopy(std::string_view data, unsigned* size)
+{
+    *size = static_cast<unsigned>(data.size());
+    return static_cast<unsigned char*>(std::memcpy(new unsigned char[data.size()], data.data(), data.size()));
+}
+
+ModuleHandle* OpenModule(unsigned short const* path)
+{
+    if (path == nullptr || !memoryBundle.hasArchive) return nullptr;
+    if (memoryBundle.modules++ == 0)
+        while (*path != 0)
+            memoryBundle.path += static_cast<char16_t>(*path++);
+    return new ModuleHandle;
+}
+
+void CloseModule(ModuleHandle* module)
+{
+    delete module;
+    if (--memoryBundle.modules == 0) std::puts("closed");
+}
+
+FileHandle* OpenFile(ModuleHandle* module, char const* name, char const* /*variant*/)
+{
+    return module != nullptr && *name == 'f' ? ++memoryBundle.openFiles, new FileHandle : nullptr;
+}
+
+unsigned char* LoadFile(ModuleHandle* module, char const* /*name*/, char const* /*variant*/, unsigned* size)
+{
+    return module != nullptr ? NewCopy("data", size) : nullptr;
+}
+
+bool ReadFile(FileHandle* file, void* buffer, unsigned size, unsigned* read)
+{
+    *read =
+        static_cast<unsigned>(file->rest.copy(static_cast<char*>(buffer), memoryBundle.failing ? 1 : size));
+    file->rest.remove_prefix(*read);
+    return memoryBundle.Call();
+}
+
+bool GetFileSize(FileHandle* /*file*/, unsigned long long* size) { return *size = 4, memoryBundle.Call(); }
+
+bool RewindFile(FileHandle* file) { return *file = {}, memoryBundle.Call(); }
+
+unsigned char* GetFileError(FileHandle* /*file*/, unsigned* size)
+{
+    return memoryBundle.failure.empty() ? nullptr : NewCopy(memoryBundle.failure, size);
+}
+
+void CloseFile(FileHandle* file)
+{
+    delete file;
+    --memoryBundle.openFiles;
+}
+
+}

@@ -1,0 +1,17 @@
+#pragma once
+
+#include <atomic>
+#include <string>
+
+/// The resource service of test programs that link its twin in memory: an archive of one file, "file", which
+/// holds "data".
+struct MemoryBundle {
+    bool hasArchive = true;
+    bool failing = false;  ///< every operation on an open file fails, after reading one byte
+    std::string failure;   ///< the error chain that it tells, if any
+    std::u16string path;   ///< of the first module
+    /// Counts an operation; false if it fails.
+    bool Call() { return ++calls > 0 && !failing; }
+    std::atomic<int> modules = 0, openFiles = 0, calls = 0;
+};
+extern MemoryBundle memoryBundle;

@@ -8,6 +8,7 @@
 #include <tessella/event.h>
 #include <tessella/export.h>
 #include <tessella/image.h>
+#include <tessella/keyboard.h>
 #include <tessella/region.h>
 #include <tessella/screen.h>
 #include <tessella/session.h>

@@ -1,0 +1,72 @@
+#pragma once
+
+#include <cstdint>
+
+/// Virtual key codes, `GrEvent::vk`: which key it is, whatever the layout prints on it. A key with a
+/// character has the code of the character that English keyboards have at its place, without shift: 'q' is
+/// right of tab in France, too. Some layouts say 'M' instead of 'm'. Other codes than characters, and the
+/// keys whose code is another character than their own, stand here.
+enum : std::uint32_t {
+    GrVkPeriod = 0x2A,        ///< the key right of the comma
+    GrVkLeftBracket = 0x7B,   ///< the key right of p
+    GrVkRightBracket = 0x7D,  ///< and the one beside it
+    GrVkLessGreater = 0x9F,   ///< the key between left shift and the letters; American keyboards lack it
+
+    GrVkBackspace = 0xFF08,
+    GrVkTab = 0xFF09,
+    GrVkReturn = 0xFF0D,
+    GrVkPause = 0xFF13,
+    GrVkScrollLock = 0xFF14,
+    GrVkSystemRequest = 0xFF15,
+    GrVkEscape = 0xFF1B,
+    GrVkDelete = 0xFF1C,
+    GrVkHome = 0xFF50,
+    GrVkLeft = 0xFF51,
+    GrVkUp = 0xFF52,
+    GrVkRight = 0xFF53,
+    GrVkDown = 0xFF54,
+    GrVkPageUp = 0xFF55,
+    GrVkPageDown = 0xFF56,
+    GrVkEnd = 0xFF57,
+    GrVkLeftLogo = 0xFF60,
+    GrVkRightLogo = 0xFF61,
+    GrVkInsert = 0xFF63,
+    GrVkMenu = 0xFF67,
+    GrVkNumLock = 0xFF7F,
+
+    GrVkF1 = 0xFFBE,  ///< the others follow
+    GrVkF10 = 0xFFC7,
+    GrVkF11 = 0xFFC8,
+    GrVkF12 = 0xFFC9,
+
+    GrVkLeftShift = 0xFFE1,
+    GrVkRightShift = 0xFFE2,
+    GrVkLeftControl = 0xFFE3,
+    GrVkRightControl = 0xFFE4,
+    GrVkCapsLock = 0xFFE5,
+    GrVkLeftAlt = 0xFFE9,
+    GrVkRightAlt = 0xFFEA,
+
+    // The numeric pad without num lock, or with shift.
+    GrVkPadCentre = 0x7F80,
+    GrVkPadEnter = 0x7F8D,  ///< its character is 0x13
+    GrVkPadHome = 0x7F95,
+    GrVkPadLeft = 0x7F96,
+    GrVkPadUp = 0x7F97,
+    GrVkPadRight = 0x7F98,
+    GrVkPadDown = 0x7F99,
+    GrVkPadPageUp = 0x7F9A,
+    GrVkPadPageDown = 0x7F9B,
+    GrVkPadEnd = 0x7F9C,
+    GrVkPadInsert = 0x7F9E,
+    GrVkPadDelete = 0x7F9F,
+    GrVkPadMultiply = 0x7FAA,
+    GrVkPadAdd = 0x7FAB,
+    GrVkPadSubtract = 0x7FAD,
+    GrVkPadDivide = 0x7FAF,
+
+    // The same keys with num lock.
+    GrVkPadDecimal = 0x7FAE,
+    GrVkPad0 = 0x7FB0,  ///< the others follow
+    GrVkPad9 = 0x7FB9
+};

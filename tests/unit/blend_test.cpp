@@ -164,23 +164,22 @@ TEST(Blend, FillsHolesAndRefusesWhatCannotBeBlended)
         EXPECT_EQ(picture.Blended(1, 2, {true, false, false, 128}, image), 2u) << "there is no alpha plane";
 }
 
-TEST(Blit, TakesAnyCoordinates)
+TEST(Blit, TakesAnyCoordinatesAndNoUnknownFormat)
 {
     constexpr int kMin = std::numeric_limits<int>::min(), kMax = std::numeric_limits<int>::max();
     Picture picture;
-    GrImage target(2, 2, GrImageTrueColor), odd(2, 2, nullptr, nullptr, 0);
-    odd.bits = 99;
-    odd.bytes = 4;
-    GrBitmap const empty(0, 0);
     for (int const origin : {kMin, -1, 0, 1, kMax}) {
         picture.context->SetOrigin(origin, origin);
         for (GrRect const& rect : {GrRect{kMin, kMin, kMax, kMax}, {kMax, kMax, kMin, kMin}, {5, 0, -5, 9}}) {
             picture.context->CopyFromContext(rect, picture.context.get(), kMax, kMin);
-            picture.context->DrawBitmap(rect.x1, rect.y1, empty);
-            picture.context->DrawImageDirect({5, 0, -5, 9}, target, 0, 0);
+            picture.context->DrawBitmap(rect.x1, rect.y1, GrBitmap(0, 0));
+            picture.context->DrawImageDirect({5, 0, -5, 9}, picture.image, 0, 0);
             picture.context->DrawImageAlpha(rect, nullptr, kMin, kMax, {true, false, true, 9});
         }
     }
+    GrImage odd(2, 2, nullptr, nullptr, 0);
+    odd.bits = 99;
+    odd.bytes = 4;
     testing::internal::CaptureStderr();
     picture.context->DrawImage({0, 0, 2, 2}, odd, 0, 0);
     picture.context->ReadImage({0, 0, 2, 2}, odd, 0, 0);

@@ -4,7 +4,6 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <cstring>
 #include <limits>
 #include <memory>
@@ -13,98 +12,68 @@
 
 namespace {
 
-using Bytes = std::vector<unsigned char>;
-
-constexpr std::size_t At(int index) { return static_cast<std::size_t>(index); }
-
-/// Compares the rows for one width of registers with those that go pixel by pixel.
+/// Compares the rows for one width of registers with those that go pixel by pixel: first on all pairs of alpha and
+/// channel and, in 16 bits, all pixels, then on random ones of all sizes.
 template <int kLanes, typename Surface, typename Colors>
-class WideRows {
-public:
-    void Judge()
-    {
-        SCOPED_TRACE(std::to_string(kLanes) + " lanes, " + std::to_string(Colors::kBits) + " bits");
-        if (WideLanes() < kLanes) return;  // this processor cannot run them
-        // All pairs of alpha and channel; and in formats of 16 bits, all pixels.
-        Resize(256, 256);
-        for (int i = 0; i < 65536; ++i) {
-            int const pixel = Surface::kBytes <= 2 ? i : (i & 255) * 0x030201 + 0x11555500;
-            alphas[At(i)] = static_cast<unsigned char>(i / 256);
-            colors[At(i)] = GrMakeColor(static_cast<std::uint8_t>(i), static_cast<std::uint8_t>(i + 85),
-                static_cast<std::uint8_t>(i + 170), static_cast<std::uint8_t>(i * 7));
-            Surface::WritePixel(target.data(), i, static_cast<typename Surface::Pixel>(pixel));
+void JudgeRows()
+{
+    using Rows = GrWideRows<kLanes, Surface, Colors>;
+    using Pixel = typename Colors::Pixel;
+    if (WideLanes() < kLanes) return;  // this processor cannot run them
+    SCOPED_TRACE(std::to_string(kLanes) + " lanes, " + std::to_string(Colors::kBits) + " bits");
+    std::mt19937 random(std::random_device{}());
+    for (unsigned round = 0; round < 150; ++round) {
+        bool const all = round == 0;
+        unsigned const width = all ? 256 : 1 + random() % 300, height = all ? 256 : 1 + random() % 35;
+        std::size_t const area = width * height;
+        std::vector<unsigned char> target(area * Surface::kBytes), alphas(area), written(target);
+        std::vector<GrColor> colors(area), read(area);
+        unsigned run = 0;  // like an icon's
+        for (unsigned i = 0; i < area; ++i) {
+            if (random() % 20 == 0) run = random() % 3;
+            alphas[i] = static_cast<unsigned char>(all ? i >> 8 : run == 0 ? random() : run == 1 ? 0 : 255);
+            colors[i] = all ? i * 0x07010301 + 0x5500 : static_cast<GrColor>(random());
+            auto const pixel = all && Surface::kBytes > 2 ? (i & 255) * 0x030201 + 0x11555500
+                : all                                     ? i
+                                                          : random();
+            Surface::WritePixel(target.data(), static_cast<int>(i), static_cast<Pixel>(pixel));
         }
-        JudgeConversion();
-        for (int const alpha : {0, 1, 40, 128, 254, 255})
-            JudgeBlends(alpha);
-        for (int round = 0; round < 150 && !testing::Test::HasFailure(); ++round) {
-            Resize(Number(1, 300), Number(1, 35));
-            JudgeConversion();
-            JudgeBlends(Number(0, 255));
+
+        int const count = static_cast<int>(area);
+        Rows::Read(target.data(), count, read.data());
+        Rows::Write(written.data(), count, colors.data());
+        for (int i = 0; i < count; ++i) {
+            auto const pixel = static_cast<Pixel>(Surface::ReadPixel(target.data(), i));
+            ASSERT_EQ(read[static_cast<unsigned>(i)], Colors::FromPixel(pixel));
+            ASSERT_EQ(
+                Surface::ReadPixel(written.data(), i), Colors::ToPixel(colors[static_cast<unsigned>(i)]));
         }
+
+        // With and without colours, alpha values, something below, diffusion.
+        std::vector<std::int32_t> errors(width * 3);
+        for (int kind = 0; kind < (Colors::kDithers ? 16 : 8); ++kind)
+            for (unsigned alpha = all ? 0 : random() % 256; alpha < 256; alpha += all ? 51 : 256) {
+                auto expected = target, actual = target;
+                GrBlend blend{{expected.data(), std::ptrdiff_t{width} * Surface::kBytes,
+                                  static_cast<int>(width), static_cast<int>(height)},
+                    kind & 1 ? reinterpret_cast<unsigned char*>(colors.data()) : nullptr,
+                    kind & 2 ? alphas.data() : nullptr, static_cast<int>(width),
+                    static_cast<std::uint8_t>(alpha), (kind & 4) != 0, Colors::ToPixel(colors[0]),
+                    Surface::kAllBits, kind & 8 ? errors.data() : nullptr};
+                BlendPixels<Surface, Colors>(blend);
+                blend.target.address = actual.data();
+                Rows::Blend(blend);
+                ASSERT_TRUE(actual == expected) << width << " by " << height << ", kind " << kind;
+            }
     }
-
-private:
-    int Number(int from, int to) { return std::uniform_int_distribution(from, to)(random); }
-
-    void Resize(int newWidth, int newHeight)
-    {
-        width = newWidth;
-        height = newHeight;
-        colors.resize(At(width * height));
-        alphas.resize(At(width * height));
-        target.resize(At(width * height * Surface::kBytes));
-        std::generate(colors.begin(), colors.end(), [&] { return static_cast<GrColor>(random()); });
-        std::generate(target.begin(), target.end(), [&] { return static_cast<unsigned char>(random()); });
-        int run = 0;  // like an icon's
-        for (auto& alpha : alphas) {
-            if (Number(0, 20) == 0) run = Number(0, 2);
-            alpha = static_cast<unsigned char>(run == 0 ? random() : run == 1 ? 0 : 255);
-        }
-    }
-
-    /// With and without colours, alpha values, something below, diffusion.
-    void JudgeBlends(int alpha)
-    {
-        std::vector<std::int32_t> errors(At(width * 3));
-        for (int kind = 0; kind < (Colors::kDithers ? 16 : 8); ++kind) {
-            Bytes expected = target, actual = target;
-            GrBlend blend{{expected.data(), std::ptrdiff_t{width} * Surface::kBytes, width, height},
-                kind & 1 ? reinterpret_cast<unsigned char*>(colors.data()) : nullptr,
-                kind & 2 ? alphas.data() : nullptr, width, static_cast<std::uint8_t>(alpha), (kind & 4) != 0,
-                Colors::ToPixel(colors[0]), Surface::kAllBits, kind & 8 ? errors.data() : nullptr};
-            BlendPixels<Surface, Colors>(blend);
-            blend.target.address = actual.data();
-            GrWideRows<kLanes, Surface, Colors>::Blend(blend);
-            ASSERT_TRUE(actual == expected) << width << " by " << height << ", kind " << kind;
-        }
-    }
-
-    void JudgeConversion()
-    {
-        std::vector<GrColor> read(colors.size());
-        Bytes written(target.size());
-        GrWideRows<kLanes, Surface, Colors>::Read(target.data(), width * height, read.data());
-        GrWideRows<kLanes, Surface, Colors>::Write(written.data(), width * height, colors.data());
-        for (int i = 0; i < width * height; ++i) {
-            auto const pixel = static_cast<typename Colors::Pixel>(Surface::ReadPixel(target.data(), i));
-            ASSERT_EQ(read[At(i)], Colors::FromPixel(pixel));
-            ASSERT_EQ(Surface::ReadPixel(written.data(), i), Colors::ToPixel(colors[At(i)]));
-        }
-    }
-
-    std::mt19937 random{std::random_device{}()};
-    int width, height;
-    std::vector<GrColor> colors;
-    Bytes target, alphas;
-};
+}
 
 template <typename Surface, typename Colors>
 void JudgeWideRows()
 {
-    WideRows<4, Surface, Colors>().Judge();
-    WideRows<8, Surface, Colors>().Judge();
-    WideRows<16, Surface, Colors>().Judge();
+    JudgeRows<4, Surface, Colors>();
+    JudgeRows<8, Surface, Colors>();
+    JudgeRows<16, Surface, Colors>();
 }
 
 TEST(WideRows, GiveTheSamePixelsAsOneByOne)

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <iterator>
 #include <memory>
 
 template <typename S, GrColorsPolicy Colors>
@@ -68,17 +69,18 @@ void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* 
         this->OnSurface(dst), sx, sy, [&](GrRange xRange, GrRange yRange, int sourceX, int sourceY) {
             unsigned char* row = this->RowAddress(yRange.r1);
             for (int y = 0; y < yRange.r2 - yRange.r1; ++y, row += this->Stride()) {
-                GrColor colors[kColorsAtOnce];
-                int atOnce = 1;
-                for (int x = xRange.r1; x < xRange.r2; x += atOnce) {
-                    int const column = Moved(sourceX, x - xRange.r1);
-                    if (readAhead) {
-                        atOnce = std::min(xRange.r2 - x, kColorsAtOnce);
-                        colorSource.Read(column, Moved(sourceY, y), atOnce, colors);
-                    } else {
-                        colors[0] = source->GetPixel(column, Moved(sourceY, y));
-                    }
-                    WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), atOnce, colors);
+                int const rowY = Moved(sourceY, y);
+                if (!readAhead) {
+                    for (int x = 0; x < xRange.r2 - xRange.r1; ++x)
+                        this->WritePixel(
+                            row, xRange.r1 + x, Colors::ToPixel(source->GetPixel(Moved(sourceX, x), rowY)));
+                    continue;
+                }
+                GrColor colors[256];
+                for (int x = xRange.r1, count; x < xRange.r2; x += count) {
+                    count = std::min(xRange.r2 - x, static_cast<int>(std::size(colors)));
+                    colorSource.Read(Moved(sourceX, x - xRange.r1), rowY, count, colors);
+                    WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), count, colors);
                 }
             }
         });

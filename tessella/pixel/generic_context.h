@@ -126,7 +126,6 @@ public:
     void ReadClipped(int x, int y, int count, GrColor* colors) const;
 
 private:
-    static constexpr int kColorsAtOnce = 256;
     static constexpr char kSource[] = GR_SOURCE("tessella/context");
 
     /// All other images are converted pixel by pixel.

@@ -28,8 +28,9 @@ inline ImageKind const kImageKinds[] = {{Canvas::FormatOf<GrSurface8, GrColors4>
 /// where errors are diffused.
 class RandomBlits {
 public:
-    RandomBlits(GrContext& drawnContext, Canvas& judgingCanvas, unsigned seed)
-        : context(drawnContext), canvas(judgingCanvas), format(canvas.format), random(seed)
+    /// `drawnImage` is what the context draws on, or null for a screen.
+    RandomBlits(GrContext& drawnContext, GrImage const* drawnImage, Canvas& judgingCanvas, unsigned seed)
+        : context(drawnContext), drawn(drawnImage), canvas(judgingCanvas), format(canvas.format), random(seed)
     {}
 
     void Step()
@@ -42,7 +43,7 @@ public:
         switch (Number(0, 7)) {
         case 0: return DrawBitmap();
         case 1: return CopyOwnFormat();
-        case 2: return DrawMasked();
+        case 2: return drawn ? Stream() : void();
         case 3: return CopyForeign();
         case 4: return CopyOntoItself();
         case 5: return ReadForeign();
@@ -138,35 +139,31 @@ private:
             rect.x1, rect.y1, *bitmap);
     }
 
+    /// Perhaps through a mask, then back into another image.
     void CopyOwnFormat()
     {
         MayBeDirect();
-        auto const image = NewImage(format, 0), read = NewImage(format, 0), expected = NewImage(format, 0);
-        Walk([&](int x, int y, int u, int v, auto) { canvas.Write(x, y, Pixel(*image, u, v)); });
-        (context.*(direct ? &GrContext::DrawImageDirect : &GrContext::DrawImage))(rect, *image, sx, sy);
+        auto const source = NewImage(format, 0), read = NewImage(format, 0), expected = NewImage(format, 0);
+        auto const mask = NewBitmap(kWidth, kHeight);
+        bool const masked = Chance();
+        Walk([&](int x, int y, int u, int v, auto) {
+            if (!masked || Bit(*mask, u, v)) canvas.Write(x, y, Pixel(*source, u, v));
+        });
+        if (masked)
+            (context.*(direct ? &GrContext::DrawImageMaskedDirect : &GrContext::DrawImageMasked))(
+                rect, *source, *mask, sx, sy);
+        else
+            (context.*(direct ? &GrContext::DrawImageDirect : &GrContext::DrawImage))(rect, *source, sx, sy);
+        context.DrawImageMasked(rect, *source, *NewBitmap(kWidth, kHeight + 1), sx, sy);
 
-        auto const size = static_cast<std::size_t>(kWidth * kHeight * format.bytes);
+        auto const bytes = static_cast<unsigned>(format.bytes), size = kWidth * kHeight * bytes;
         std::memcpy(expected->pixels, read->pixels, size);
         Walk([&](int x, int y, int u, int v, auto) {
             std::uint32_t const pixel = canvas.Read(x, y);
-            std::memcpy(expected->pixels + (v * kWidth + u) * format.bytes, &pixel,
-                static_cast<unsigned>(format.bytes));
+            std::memcpy(expected->pixels + (v * kWidth + u) * format.bytes, &pixel, bytes);
         });
         (context.*(direct ? &GrContext::ReadImageDirect : &GrContext::ReadImage))(rect, *read, sx, sy);
         EXPECT_EQ(std::memcmp(read->pixels, expected->pixels, size), 0);
-    }
-
-    void DrawMasked()
-    {
-        MayBeDirect();
-        auto const image = NewImage(format, 0);
-        auto const mask = NewBitmap(kWidth, kHeight);
-        Walk([&](int x, int y, int u, int v, auto) {
-            if (Bit(*mask, u, v)) canvas.Write(x, y, Pixel(*image, u, v));
-        });
-        (context.*(direct ? &GrContext::DrawImageMaskedDirect : &GrContext::DrawImageMasked))(
-            rect, *image, *mask, sx, sy);
-        context.DrawImageMasked(rect, *image, *NewBitmap(kWidth, kHeight + 1), sx, sy);
     }
 
     /// From a context with a clip and an origin of its own, or from an image as a whole; not only where it has
@@ -213,6 +210,37 @@ private:
             for (int x = rect.x1; x < rect.x2; ++x)
                 EXPECT_EQ(
                     Pixel(*image, sx + x - rect.x1, sy + y - rect.y1), kind.toPixel(canvas.GetPixel(x, y)));
+    }
+
+    /// Loads and unloads all pixels.
+    void Stream()
+    {
+        bool const dithers = format.dithers && !(drawn->flags & GrImageNoDither);
+        int const step = Number(drawn->alphaPlane ? 4 : 3, 5), area = drawn->width * drawn->height;
+        std::unique_ptr<unsigned char[]> const stream(NewBytes(area * step)), got(NewBytes(area * step + 8));
+        Bytes alphas(drawn->alphaPlane, drawn->alphaPlane + (drawn->alphaPlane ? area : 0));
+        Bytes unloaded(got.get(), got.get() + area * step + 8);
+        Canvas::Errors errors(drawn->width);
+        for (int i = 0; i < area; ++i) {
+            int const x = i % drawn->width, y = i / drawn->width;
+            if (x == 0) errors.StartRow();
+            unsigned char const* const from = stream.get() + i * step;
+            GrColor const color = GrMakeColor(from[0], from[1], from[2], alphas.empty() ? 0 : from[3]);
+            auto* const alpha = alphas.empty() ? nullptr : &alphas[static_cast<std::size_t>(i)];
+            if (!dithers) {
+                canvas.Write(x, y, format.toPixel(color));
+                if (alpha) *alpha = from[3];
+            } else if (!alpha || *alpha == 255) {
+                canvas.Write(x, y, errors.Diffuse(format, color, x));
+            }
+            std::uint64_t const back = format.fromPixel(canvas.Read(x, y));
+            std::memcpy(&unloaded[static_cast<std::size_t>(i * step)], &back, i == area - 1 ? 3 : 8);
+        }
+        auto& whole = static_cast<GrContextI&>(context);
+        whole.LoadPixels(stream.get(), static_cast<unsigned>(step));
+        whole.UnloadPixels(got.get(), static_cast<unsigned>(step));
+        EXPECT_TRUE(std::equal(unloaded.begin(), unloaded.end(), got.get()));
+        EXPECT_TRUE(std::equal(alphas.begin(), alphas.end(), drawn->alphaPlane));
     }
 
     /// With and without an image, its pixels, its alpha plane; through all operations that blend.
@@ -275,6 +303,7 @@ private:
     }
 
     GrContext& context;
+    GrImage const* drawn;
     Canvas& canvas;
     Canvas::Format const& format;
     std::mt19937 random;

@@ -128,13 +128,14 @@ private:
     std::mt19937 random;
 };
 
-void Judge(GrContext& context, unsigned char const* pixels, Canvas& canvas)
+/// `image` is what the context draws on, or null for a screen.
+void Judge(GrContext& context, GrImage const* image, unsigned char const* pixels, Canvas& canvas)
 {
     unsigned const seed = std::random_device{}();
     SCOPED_TRACE("seed " + std::to_string(seed));
     RandomDrawing drawing(context, canvas, seed);
-    RandomBlits blits(context, canvas, ~seed);
-    for (int step = 0; step < 3000; ++step) {
+    RandomBlits blits(context, image, canvas, ~seed);
+    for (int step = 0; step < 1500; ++step) {
         drawing.Step();
         if (step % 3 == 0) blits.Step();
         ASSERT_FALSE(testing::Test::HasFailure()) << "step " << step;
@@ -145,10 +146,15 @@ void Judge(GrContext& context, unsigned char const* pixels, Canvas& canvas)
 template <typename Surface, typename Colors>
 void JudgeImage()
 {
-    Canvas canvas(Canvas::FormatOf<Surface, Colors>(), kWidth, kHeight, kWidth * Surface::kBytes);
-    GrImage image(kWidth, kHeight, new unsigned char[canvas.memory.size()](), nullptr, 0);
-    std::unique_ptr<GrContext> const context(CreateImageContext<Surface, Colors>(&image));
-    Judge(*context, image.pixels, canvas);
+    for (int kind = 0; kind < 4; ++kind) {
+        Canvas canvas(Canvas::FormatOf<Surface, Colors>(), kWidth, kHeight, kWidth * Surface::kBytes);
+        GrImage image(kWidth, kHeight, new unsigned char[canvas.memory.size()](),
+            kind & 1 ? new unsigned char[kWidth * kHeight] : nullptr, kind & 2 ? GrImageNoDither : 0u);
+        for (int i = 0; image.alphaPlane && i < kWidth * kHeight; ++i)
+            image.alphaPlane[i] = static_cast<unsigned char>(i % 3 ? 255 : i);
+        std::unique_ptr<GrContext> const context(CreateImageContext<Surface, Colors>(&image));
+        Judge(*context, &image, image.pixels, canvas);
+    }
 }
 
 TEST(Contexts, ImagesOfEveryFormatMatchTheCanvas)
@@ -188,7 +194,7 @@ void JudgeScreen(unsigned bits, unsigned colorBits)
     std::unique_ptr<GrContext> const context(mode->createScreenContext(limit, 5, 6));
     canvas.SetLimit(limit);
     canvas.SetBaseOrigin(5, 6);
-    Judge(*context, memory.data(), canvas);
+    Judge(*context, nullptr, memory.data(), canvas);
 }
 
 TEST(Contexts, ScreensOfEveryModeMatchTheCanvas)
@@ -247,33 +253,11 @@ TEST(Rows, FillAndInvertWritePixelsOfAnyWidthAndNothingElse)
 /// Gives a test the row operations that other drawing is made of.
 struct Rows : GrGenericContext<GrGenericSurface<GrImageContextBase<3>, GrSurface24>, GrColors24> {
     explicit Rows(GrImage const& image) : GrGenericContext(image) {}
-    using GrGenericSurface::CopyRowsIn;
-    using GrGenericSurface::CopyRowsOut;
     using GrGenericSurface::PatternColumn;
     void LoadPixels(std::uint8_t const*, unsigned) override {}
     void LoadPixelsDithered(std::uint8_t const*, std::uint8_t const*, unsigned) override {}
     void UnloadPixels(std::uint8_t*, unsigned) override {}
 };
-
-TEST(Rows, CopyBetweenSurfaceAndImageOfTheSameFormat)
-{
-    GrImage surface(9, 6, new unsigned char[9 * 6 * 3](), nullptr, 0);
-    GrImage source(5, 4, new unsigned char[5 * 4 * 3], nullptr, 0);
-    GrImage target(4, 5, new unsigned char[4 * 5 * 3](), nullptr, 0);
-    for (unsigned char i = 0; i < 60; ++i)
-        source.pixels[i] = static_cast<unsigned char>(i + 1);
-    Rows const rows(surface);
-    rows.CopyRowsIn({2, 5}, {1, 4}, source, 1, 1);
-    rows.CopyRowsOut({2, 5}, {0, 4}, target, 1, 1);
-    for (int y = 0; y < 5; ++y)
-        for (int x = 0; x < 4; ++x)
-            for (int byte = 0; byte < 3; ++byte) {
-                bool const copied = x >= 1 && y >= 2;
-                EXPECT_EQ(
-                    target.pixels[(y * 4 + x) * 3 + byte], copied ? ((y - 1) * 5 + x) * 3 + byte + 1 : 0)
-                    << x << ", " << y << ", " << byte;
-            }
-}
 
 TEST(Rows, ColumnFollowsThePatternAndIgnoresTheRasterMode)
 {

@@ -1,3 +1,4 @@
+#include <tessella/bitmap.h>
 #include <tessella/image.h>
 #include <tessella/pixel/image_contexts.h>
 #include <tessella/screen.h>
@@ -5,9 +6,13 @@
 
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <memory>
+#include <vector>
 
 namespace {
+
+using Bytes = std::vector<unsigned char>;
 
 /// True if an image of the format has a context of the given class.
 template <typename Surface, typename Colors>
@@ -96,6 +101,43 @@ TEST(Image, TakesTheScreensFormatUnlessTrueColorIsAskedFor)
     GrImage borrowed(1, 1, pixels, alpha, GrImageHasAlpha);
     EXPECT_TRUE(borrowed.isTrueColor() && borrowed.bits == 32 && borrowed.bytes == 4);
     borrowed.Detach();
+}
+
+/// The streams have no byte more than these, and the sanitizers watch.
+TEST(Image, StreamsEndAtTheirLastByteAndFillWhatThereIs)
+{
+    GrImage image(2, 2, GrImageTrueColor);
+    Bytes three(2 * 2 * 3, 200), four(2 * 2 * 4, 200);
+    image.Load(three.data(), 3);
+    EXPECT_EQ(image.flags, GrImageTrueColor | GrImagePremultiplied);
+    image.Unload(four.data(), 4);
+    EXPECT_EQ(four, Bytes(16, 0)) << "without an alpha plane, the alpha is 0";
+    three.resize(2 * 2 * 3 + 2, 200);
+    image.Unload(three.data(), 3);
+    EXPECT_EQ(three.back(), 0);
+
+    unsigned char const stream[] = {1, 2, 3, 4, 5, 6, 7, 8};
+    GrImage alphaOnly(2, 1, GrImageHasAlpha | GrImageAlphaOnly), nothing(0, 10, GrImageHasAlpha);
+    alphaOnly.Load(stream, 4);
+    EXPECT_TRUE(alphaOnly.alphaPlane[0] == 4 && alphaOnly.alphaPlane[1] == 8);
+    alphaOnly.Unload(nullptr, 4);
+    nothing.Load(nullptr, 4);
+    nothing.Unload(nullptr, 4);
+}
+
+TEST(Bitmap, HasWholeBytesARow)
+{
+    GrBitmap bitmap(9, 2);
+    EXPECT_EQ(Bytes(bitmap.data, bitmap.data + 4), Bytes(4, 0));
+    unsigned char const bits[] = {1, 2, 3, 4};
+    bitmap.Load(bits);
+    EXPECT_EQ(std::memcmp(bitmap.data, bits, 4), 0);
+    bitmap.data[6] = 0;  // the last of three spare bytes
+    for (auto const& [width, height] : {std::pair{0, 5}, {5, 0}, {-3, 2}}) {
+        GrBitmap empty(width, height);
+        EXPECT_TRUE(empty.width == 0 && empty.height == 0 && empty.data == nullptr);
+        empty.Load(nullptr);
+    }
 }
 
 }

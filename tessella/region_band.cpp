@@ -56,6 +56,21 @@ struct Window : Span {
     RangeBuffer buffer;
 };
 
+/// Gives `result` the extent of `band`, and the capacity that a copy of it has after it was raised to give
+/// room for `peak` ranges. They are different bands; the ranges of `result` are lost.
+void Prepare(Band& result, Band const& band, int peak)
+{
+    int const capacity = GrownCapacity(band.item_count > 0 ? band.item_capacity : result.item_capacity, peak);
+    if (result.item_capacity < capacity) {
+        GrRange* const larger = NewSlots(result, capacity);
+        delete[] result.items;
+        result.items = larger;
+    }
+    result.item_capacity = capacity;
+    result.r1 = band.r1;
+    result.r2 = band.r2;
+}
+
 /// `result` = `band` with the ranges `first` to `last` - 1 replaced by `made`, and the capacity of `band`
 /// raised to give room for `peak` ranges.
 void Splice(Band& result, Band const& band, int first, int last, GrRange const* made,
@@ -68,16 +83,7 @@ void Splice(Band& result, Band const& band, int first, int last, GrRange const* 
         if (peak > result.item_capacity) Resize(result, GrownCapacity(result.item_capacity, peak));
         if (first + count != last) MoveSlots(result.items + first + count, result.items + last, tail);
     } else {
-        int const capacity =
-            GrownCapacity(band.item_count > 0 ? band.item_capacity : result.item_capacity, peak);
-        if (result.item_capacity < capacity) {
-            GrRange* const larger = NewSlots(result, capacity);
-            delete[] result.items;
-            result.items = larger;
-        }
-        result.item_capacity = capacity;
-        result.r1 = band.r1;
-        result.r2 = band.r2;
+        Prepare(result, band, peak);
         MoveSlots(result.items, band.items, first);
         MoveSlots(result.items + first + count, band.items + last, tail);
     }
@@ -88,6 +94,12 @@ void Splice(Band& result, Band const& band, int first, int last, GrRange const* 
 /// The union with one range, which is all that a rectangle brings.
 void SpliceUnion(Band& result, Band const& band, GrRange joined)
 {
+    if (&result != &band && band.item_count <= 0) {  // rows that were empty, as most that a rectangle meets
+        Prepare(result, band, 1);
+        result.items[0] = joined;
+        result.item_count = 1;
+        return;
+    }
     Span const span(band, joined.r1, joined.r2);
     int next = span.first;
     for (; next != span.last && band.items[next].r1 < joined.r2; ++next) {

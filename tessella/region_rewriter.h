@@ -2,6 +2,8 @@
 
 #include <tessella/region_storage.h>
 
+#include <utility>
+
 /// Rewrites a region's list of bands in place, from one band on: reads at `from`, writes at `to`.
 ///
 ///     begin        to            to+spares     from          end            capacity
@@ -19,7 +21,7 @@ public:
     /// The bands before slot `index` stay as they are.
     BandRewriter(GrItemArray<Band>& bands, int index)
         : list(bands), begin(bands.items), to(begin + index), from(to), end(begin + bands.item_count),
-          capacity(bands.item_capacity)
+          capacity(bands.item_capacity), free(bands.item_capacity - bands.item_count)
     {}
     BandRewriter(BandRewriter const&) = delete;
     BandRewriter& operator=(BandRewriter const&) = delete;
@@ -27,6 +29,7 @@ public:
     /// The list ends behind the last band written, on every way out; what was not read becomes spare.
     ~BandRewriter()
     {
+        if (from != end) OpenRest();
         if (to + spares != from) MoveSlots(to + spares, from, end - from);
         list.items = begin;
         list.item_count = static_cast<int>(to - begin);
@@ -58,6 +61,7 @@ public:
     {
         if (to != begin && SameRanges(*to, to[-1])) {
             to[-1].r2 = to->r2;
+            OpenRest();
         } else {
             ++to;
             --spares;
@@ -141,19 +145,40 @@ private:
     void OpenGap(std::ptrdiff_t following)
     {
         GR_ASSERT_TEXT(spares == 0, "from==to");
-        std::ptrdiff_t const unread = end - from;
-        int const free = grown ? 0 : capacity - static_cast<int>(end - begin);
-        if (free > 0)
-            SwapWithSpares(unread, free);
+        if (free == 0)
+            Grow(end - from, following);
+        else if (blank || (free <= SavedSlots::kMost && OwnNothing(end, free)))
+            OpenBlank(static_cast<int>(std::min<std::ptrdiff_t>(free, 2 * following)));
         else
-            Grow(unread, following);
+            SwapWithSpares();
     }
 
-    void SwapWithSpares(std::ptrdiff_t unread, int free)
+    /// Spares that own nothing are all alike: only as many as are likely to be used change places with the
+    /// unread bands, which then need not come back.
+    void OpenBlank(int count)
     {
+        MoveSlots(from + count, from, end - from);
+        for (int i = 0; i < count; ++i)
+            Disown(from[i]);
+        from += count;
+        end += count;
+        spares += count;
+        free -= count;
+        blank = true;
+    }
+
+    /// The others follow as soon as it matters where they are.
+    void OpenRest()
+    {
+        if (blank && free > 0) OpenBlank(free);
+    }
+
+    void SwapWithSpares()
+    {
+        int const unread = static_cast<int>(end - from);
         SavedSlots saved;
         if (unread > SavedSlots::kFew && free <= SavedSlots::kMost) {
-            int const turn = static_cast<int>(unread % free);
+            int const turn = unread % free;
             saved.Save(end, free);
             MoveSlots(from + free, from, unread);
             saved.Restore(from + turn, 0, free - turn);
@@ -167,28 +192,45 @@ private:
         }
         from += free;
         end += free;
-        spares = free;
+        spares = std::exchange(free, 0);
+    }
+
+    static bool OwnNothing(Band const* slots, int count)
+    {
+        bool nothing = true;
+        for (int i = 0; i < count && nothing; ++i)
+            nothing = slots[i].items == nullptr;
+        return nothing;
+    }
+
+    static void Disown(Band& slot)
+    {
+        slot.items = nullptr;
+        slot.item_count = slot.item_capacity = 0;
     }
 
     void Grow(std::ptrdiff_t unread, std::ptrdiff_t following)
     {
+        spares = kGrowth;
         if (from - to < kGrowth) {
             std::ptrdiff_t const written = to - begin;
             std::ptrdiff_t const size = written + kGrowth + following + unread;
+            if (2 * following < kGrowth) spares = static_cast<int>(2 * following);
             // Not zeroed: slots count only once they have been moved to, or zeroed below.
             Band* const larger = new Band[static_cast<std::size_t>(size)];
             MoveSlots(larger, begin, written);
-            MoveSlots(larger + size - unread, from, unread);
-            delete[] begin;
-            begin = larger;
-            to = begin + written;
-            end = begin + size;
-            from = end - unread;
+            to = larger + written;
+            Band* const place = spares < kGrowth ? to + spares : larger + size - unread;
+            MoveSlots(place, from, unread);
+            delete[] std::exchange(begin, larger);
+            from = place;
+            end = place + unread;
         }
-        ZeroSlots(to, kGrowth);
+        free = kGrowth - spares;
+        blank = true;
+        ZeroSlots(to, spares);
+        ZeroSlots(end, free);
         capacity += kGrowth;
-        spares = kGrowth;
-        grown = true;
     }
 
     GrItemArray<Band>& list;
@@ -197,6 +239,7 @@ private:
     Band* from;
     Band* end;
     int capacity;
+    int free;  // spare slots behind the unread bands
     int spares = 0;
-    bool grown = false;
+    bool blank = false;  // the slots behind the unread bands own nothing
 };

@@ -80,18 +80,22 @@ public:
     /// Keeps all bands that are left.
     void KeepRest()
     {
+        if (to == begin && from != end) Keep();
         while (from != end) {
-            Band const* last = from;
-            if (to == begin) ++last;
-            for (Band const* above = last == from ? to - 1 : from; last != end && !SameRanges(*last, *above);
-                 ++last)
-                above = last;
-            MoveRun(last - from);
+            MoveRun(FirstLikeAbove(from, end, to - 1) - from);
             if (from != end) Keep();
         }
     }
 
 private:
+    /// The first band with the same ranges as the one above it.
+    static Band const* FirstLikeAbove(Band const* band, Band const* end, Band const* above)
+    {
+        for (; band != end; above = band++)
+            if (SameRanges(*band, *above)) break;
+        return band;
+    }
+
     /// Room for a few slots while bands move past them as a block.
     class SavedSlots {
     public:
@@ -158,8 +162,7 @@ private:
     void OpenBlank(int count)
     {
         MoveSlots(from + count, from, end - from);
-        for (int i = 0; i < count; ++i)
-            Disown(from[i]);
+        ZeroSlots(from, count);
         from += count;
         end += count;
         spares += count;
@@ -201,12 +204,6 @@ private:
         for (int i = 0; i < count && nothing; ++i)
             nothing = slots[i].items == nullptr;
         return nothing;
-    }
-
-    static void Disown(Band& slot)
-    {
-        slot.items = nullptr;
-        slot.item_count = slot.item_capacity = 0;
     }
 
     void Grow(std::ptrdiff_t unread, std::ptrdiff_t following)

@@ -102,7 +102,7 @@ bool VerifyBand(Band const& band)
 
 Band const* FirstImperfect(Band const* band, Band const* end, int above)
 {
-    constexpr std::ptrdiff_t kFew = 16;
+    constexpr std::ptrdiff_t kFew = 24;
     // A few bands, just written, are sooner looked at one by one than waited for.
     return end - band > kFew && WideRegistersPresent() ? FirstImperfectWide(band, end, above)
                                                        : FirstImperfectPlain(band, end, above);

@@ -7,7 +7,7 @@
 // The three merges of range lists share one shape. Where the other band begins and ends is searched for; the
 // ranges of this band in between, the window, are merged with the other's into a buffer; and what was made
 // takes the window's place, in this band or in a copy of it. Ranges outside the window are at most moved as a
-// block.
+// block. Of small bands the window is all, and goes straight into the copy.
 //
 //     band    ===  ===   ====  ==  ===       other      ==  =====  =
 //                  [   window   ]            made   ===  ========  ===
@@ -106,15 +106,19 @@ void UniteWithOne(Band& result, Band const& band, GrRange joined)
     Splice(result, band, span.first, next, &joined, 1, peak);
 }
 
-/// The difference to one range: of what it touches, the outer ends are left.
-void SubtractOne(Band& result, Band const& band, GrRange const& cut)
+/// The difference to one range: of what it touches, the outer ends are left. One or two ranges are not worth
+/// a search; there must be room for both ends of each, which damaged lists may need.
+void SubtractOne(Band& result, Band const& band, GrRange cut)
 {
     constexpr int kFew = 2;
-    if (&result != &band && band.item_count <= std::min(kFew, band.item_capacity / 2)) {
-        Prepare(result, band, 0);
+    int const rangeCount = band.item_count;
+    if (rangeCount <= std::min(kFew, band.item_capacity / 2)) {
+        GrRange ranges[kFew];
+        std::copy_n(band.items, rangeCount, ranges);
+        if (&result != &band) Prepare(result, band, 0);
         GrRange* out = result.items;
-        for (int i = 0; i < band.item_count; ++i) {
-            GrRange const range = band.items[i];
+        for (int i = 0; i < rangeCount; ++i) {
+            GrRange const range = ranges[i];
             *out = {range.r1, std::min(range.r2, cut.r1)};
             out += range.r1 < cut.r1;
             *out = {std::max(range.r1, cut.r2), range.r2};
@@ -155,10 +159,11 @@ template <void merge(Walk&, Band const&), Outside outside>
 void MergeInto(Band& result, Band const& band, Band const& other)
 {
     constexpr int kFew = 16;
-    int const most = band.item_count + other.item_count;
+    int const count = std::max(band.item_count, 0);
+    int const most = count + other.item_count;
     if (&result != &band && most <= std::min(kFew, Capacity(result, band))) {
         Prepare(result, band, 0);
-        Walk walk{band.items, band.items + band.item_count, band.items, result.items};
+        Walk walk{band.items, band.items + count, band.items, result.items};
         merge(walk, other);
         while (outside == Outside::Stays && walk.next != walk.end)
             *walk.out++ = *walk.next++;

@@ -14,6 +14,8 @@
 /// must be written than was read, a gap opens: the spare slots at the end of the list change places with the
 /// unread bands, and after them come 10 fresh slots at a time. The recorded capacity counts these tens, while
 /// the block itself is made large enough for what is likely to follow; only then are there unused slots.
+/// Among spares that own nothing, a gap is no wider than is likely to be used: where such a slot lies is no
+/// matter until one with storage comes among them.
 class BandRewriter {
 public:
     using Band = GrRegion::Band;
@@ -21,7 +23,7 @@ public:
     /// The bands before slot `index` stay as they are.
     BandRewriter(GrItemArray<Band>& bands, int index)
         : list(bands), begin(bands.items), to(begin + index), from(to), end(begin + bands.item_count),
-          capacity(bands.item_capacity), free(bands.item_capacity - bands.item_count)
+          capacity(bands.item_capacity), free(std::max(bands.item_capacity - bands.item_count, 0))
     {}
     BandRewriter(BandRewriter const&) = delete;
     BandRewriter& operator=(BandRewriter const&) = delete;
@@ -157,8 +159,7 @@ private:
             SwapWithSpares();
     }
 
-    /// Spares that own nothing are all alike: only as many as are likely to be used change places with the
-    /// unread bands, which then need not come back.
+    /// Moves the unread bands past `count` more spares, all of which own nothing.
     void OpenBlank(int count)
     {
         MoveSlots(from + count, from, end - from);
@@ -170,7 +171,7 @@ private:
         blank = true;
     }
 
-    /// The others follow as soon as it matters where they are.
+    /// From now on it matters where the spares lie.
     void OpenRest()
     {
         if (blank && free > 0) OpenBlank(free);
@@ -208,22 +209,23 @@ private:
 
     void Grow(std::ptrdiff_t unread, std::ptrdiff_t following)
     {
-        spares = kGrowth;
+        int opened = kGrowth;
         if (from - to < kGrowth) {
             std::ptrdiff_t const written = to - begin;
             std::ptrdiff_t const size = written + kGrowth + following + unread;
-            if (2 * following < kGrowth) spares = static_cast<int>(2 * following);
             // Not zeroed: slots count only once they have been moved to, or zeroed below.
             Band* const larger = new Band[static_cast<std::size_t>(size)];
+            if (2 * following < kGrowth) opened = static_cast<int>(2 * following);
+            Band* const place = larger + (opened < kGrowth ? written + opened : size - unread);
             MoveSlots(larger, begin, written);
-            to = larger + written;
-            Band* const place = spares < kGrowth ? to + spares : larger + size - unread;
             MoveSlots(place, from, unread);
             delete[] std::exchange(begin, larger);
+            to = begin + written;
             from = place;
             end = place + unread;
         }
-        free = kGrowth - spares;
+        spares = opened;
+        free = kGrowth - opened;
         blank = true;
         ZeroSlots(to, spares);
         ZeroSlots(end, free);

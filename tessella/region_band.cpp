@@ -7,7 +7,7 @@
 // The three merges of range lists share one shape. Where the other band begins and ends is searched for; the
 // ranges of this band in between, the window, are merged with the other's into a buffer; and what was made
 // takes the window's place, in this band or in a copy of it. Ranges outside the window are at most moved as a
-// block. Of small bands the window is all, and goes straight into the copy.
+// block. Of small bands the window is all, and what is made goes straight to its place.
 //
 //     band    ===  ===   ====  ==  ===       other      ==  =====  =
 //                  [   window   ]            made   ===  ========  ===
@@ -154,16 +154,24 @@ struct Walk {
 
 enum class Outside { Stays, Goes };
 
-/// Merges the window of `band`, or all of it if that is little and can go straight into the result.
+/// Merges the window of `band`, or all of it if that is little and can go straight into the result. A band
+/// that is its own result is then read from a copy.
 template <void merge(Walk&, Band const&), Outside outside>
 void MergeInto(Band& result, Band const& band, Band const& other)
 {
     constexpr int kFew = 16;
     int const count = std::max(band.item_count, 0);
     int const most = count + other.item_count;
-    if (&result != &band && most <= std::min(kFew, Capacity(result, band))) {
-        Prepare(result, band, 0);
-        Walk walk{band.items, band.items + count, band.items, result.items};
+    if (most <= std::min(kFew, Capacity(result, band))) {
+        GrRange copy[kFew];
+        GrRange const* items = band.items;
+        if (&result == &band) {
+            MoveSlots(copy, items, count);
+            items = copy;
+        } else {
+            Prepare(result, band, 0);
+        }
+        Walk walk{items, items + count, items, result.items};
         merge(walk, other);
         while (outside == Outside::Stays && walk.next != walk.end)
             *walk.out++ = *walk.next++;

@@ -3,27 +3,15 @@
 
 using Band = GrRegion::Band;
 
-// The delegation makes the object whole, so that its destructor runs if the assignment throws.
-GrRegion::GrRegion(GrRect const& rect) : GrRegion() { *this = rect; }
+namespace {
 
-GrRegion::GrRegion(GrRegion const& other) : GrRegion() { *this = other; }
+// Regions of one rectangle are made and thrown away all the time; what that takes stands here once, without
+// the calls through which the exported operators reach each other.
 
-GrRegion::~GrRegion() { Clear(); }
-
-void GrRegion::Clear()
-{
-    for (int i = 0; i < bands.item_capacity; ++i)
-        delete[] bands.items[i].items;
-    delete[] bands.items;
-    bands = {};
-}
-
-GrRegion::operator bool() const { return HasRanges(bands); }
-
-GrRegion& GrRegion::operator=(GrRect const& rect)
+void Assign(GrItemArray<Band>& bands, GrRect const& rect)
 {
     bands.item_count = 0;
-    if (rect.IsEmpty()) return *this;
+    if (rect.IsEmpty()) return;
     if (bands.items == nullptr) Allocate(bands, kGrowth);
     Band& band = bands.items[0];
     if (band.items == nullptr) Allocate(band, kGrowth);
@@ -32,6 +20,36 @@ GrRegion& GrRegion::operator=(GrRect const& rect)
     band.items[0] = {rect.x1, rect.x2};
     band.item_count = 1;
     bands.item_count = 1;
+}
+
+void Release(GrItemArray<Band> const& bands)
+{
+    Band const* const end = bands.items + bands.item_capacity;
+    for (Band const* band = bands.items; band < end; ++band)
+        delete[] band->items;
+    delete[] bands.items;
+}
+
+}
+
+// The delegation makes the object whole, so that its destructor runs if the assignment throws.
+GrRegion::GrRegion(GrRect const& rect) : GrRegion() { Assign(bands, rect); }
+
+GrRegion::GrRegion(GrRegion const& other) : GrRegion() { *this = other; }
+
+GrRegion::~GrRegion() { Release(bands); }
+
+void GrRegion::Clear()
+{
+    Release(bands);
+    bands = {};
+}
+
+GrRegion::operator bool() const { return HasRanges(bands); }
+
+GrRegion& GrRegion::operator=(GrRect const& rect)
+{
+    Assign(bands, rect);
     return *this;
 }
 

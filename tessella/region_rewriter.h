@@ -2,6 +2,8 @@
 
 #include <tessella/region_storage.h>
 
+#include <utility>
+
 /// Rewrites a region's list of bands in place, from one band on: reads at `from`, writes at `to`.
 ///
 ///     begin        to            to+spares     from          end            capacity
@@ -12,6 +14,8 @@
 /// must be written than was read, a gap opens: the spare slots at the end of the list change places with the
 /// unread bands, and after them come 10 fresh slots at a time. The recorded capacity counts these tens, while
 /// the block itself is made large enough for what is likely to follow; only then are there unused slots.
+/// Among spares that own nothing, a gap is no wider than is likely to be used: where such a slot lies is no
+/// matter until one with storage comes among them.
 class BandRewriter {
 public:
     using Band = GrRegion::Band;
@@ -19,7 +23,7 @@ public:
     /// The bands before slot `index` stay as they are.
     BandRewriter(GrItemArray<Band>& bands, int index)
         : list(bands), begin(bands.items), to(begin + index), from(to), end(begin + bands.item_count),
-          capacity(bands.item_capacity)
+          capacity(bands.item_capacity), free(std::max(bands.item_capacity - bands.item_count, 0))
     {}
     BandRewriter(BandRewriter const&) = delete;
     BandRewriter& operator=(BandRewriter const&) = delete;
@@ -27,6 +31,7 @@ public:
     /// The list ends behind the last band written, on every way out; what was not read becomes spare.
     ~BandRewriter()
     {
+        if (from != end) OpenRest();
         if (to + spares != from) MoveSlots(to + spares, from, end - from);
         list.items = begin;
         list.item_count = static_cast<int>(to - begin);
@@ -58,6 +63,7 @@ public:
     {
         if (to != begin && SameRanges(*to, to[-1])) {
             to[-1].r2 = to->r2;
+            OpenRest();
         } else {
             ++to;
             --spares;
@@ -76,18 +82,22 @@ public:
     /// Keeps all bands that are left.
     void KeepRest()
     {
+        if (to == begin && from != end) Keep();
         while (from != end) {
-            Band const* last = from;
-            if (to == begin) ++last;
-            for (Band const* above = last == from ? to - 1 : from; last != end && !SameRanges(*last, *above);
-                 ++last)
-                above = last;
-            MoveRun(last - from);
+            MoveRun(FirstLikeAbove(from, end, to - 1) - from);
             if (from != end) Keep();
         }
     }
 
 private:
+    /// The first band with the same ranges as the one above it.
+    static Band const* FirstLikeAbove(Band const* band, Band const* end, Band const* above)
+    {
+        for (; band != end; above = band++)
+            if (SameRanges(*band, *above)) break;
+        return band;
+    }
+
     /// Room for a few slots while bands move past them as a block.
     class SavedSlots {
     public:
@@ -141,19 +151,38 @@ private:
     void OpenGap(std::ptrdiff_t following)
     {
         GR_ASSERT_TEXT(spares == 0, "from==to");
-        std::ptrdiff_t const unread = end - from;
-        int const free = grown ? 0 : capacity - static_cast<int>(end - begin);
-        if (free > 0)
-            SwapWithSpares(unread, free);
+        if (free == 0)
+            Grow(end - from, following);
+        else if (blank || (free <= SavedSlots::kMost && OwnNothing(end, free)))
+            OpenBlank(static_cast<int>(std::min<std::ptrdiff_t>(free, 2 * following)));
         else
-            Grow(unread, following);
+            SwapWithSpares();
     }
 
-    void SwapWithSpares(std::ptrdiff_t unread, int free)
+    /// Moves the unread bands past `count` more spares, all of which own nothing.
+    void OpenBlank(int count)
     {
+        MoveSlots(from + count, from, end - from);
+        ZeroSlots(from, count);
+        from += count;
+        end += count;
+        spares += count;
+        free -= count;
+        blank = true;
+    }
+
+    /// From now on it matters where the spares lie.
+    void OpenRest()
+    {
+        if (blank && free > 0) OpenBlank(free);
+    }
+
+    void SwapWithSpares()
+    {
+        int const unread = static_cast<int>(end - from);
         SavedSlots saved;
         if (unread > SavedSlots::kFew && free <= SavedSlots::kMost) {
-            int const turn = static_cast<int>(unread % free);
+            int const turn = unread % free;
             saved.Save(end, free);
             MoveSlots(from + free, from, unread);
             saved.Restore(from + turn, 0, free - turn);
@@ -167,28 +196,40 @@ private:
         }
         from += free;
         end += free;
-        spares = free;
+        spares = std::exchange(free, 0);
+    }
+
+    static bool OwnNothing(Band const* slots, int count)
+    {
+        bool nothing = true;
+        for (int i = 0; i < count && nothing; ++i)
+            nothing = slots[i].items == nullptr;
+        return nothing;
     }
 
     void Grow(std::ptrdiff_t unread, std::ptrdiff_t following)
     {
+        int opened = kGrowth;
         if (from - to < kGrowth) {
             std::ptrdiff_t const written = to - begin;
             std::ptrdiff_t const size = written + kGrowth + following + unread;
             // Not zeroed: slots count only once they have been moved to, or zeroed below.
             Band* const larger = new Band[static_cast<std::size_t>(size)];
+            if (2 * following < kGrowth) opened = static_cast<int>(2 * following);
+            Band* const place = larger + (opened < kGrowth ? written + opened : size - unread);
             MoveSlots(larger, begin, written);
-            MoveSlots(larger + size - unread, from, unread);
-            delete[] begin;
-            begin = larger;
+            MoveSlots(place, from, unread);
+            delete[] std::exchange(begin, larger);
             to = begin + written;
-            end = begin + size;
-            from = end - unread;
+            from = place;
+            end = place + unread;
         }
-        ZeroSlots(to, kGrowth);
+        spares = opened;
+        free = kGrowth - opened;
+        blank = true;
+        ZeroSlots(to, spares);
+        ZeroSlots(end, free);
         capacity += kGrowth;
-        spares = kGrowth;
-        grown = true;
     }
 
     GrItemArray<Band>& list;
@@ -197,6 +238,7 @@ private:
     Band* from;
     Band* end;
     int capacity;
+    int free;  // spare slots behind the unread bands
     int spares = 0;
-    bool grown = false;
+    bool blank = false;  // the slots behind the unread bands own nothing
 };

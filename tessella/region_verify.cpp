@@ -13,17 +13,22 @@
 
 using Band = GrRegion::Band;
 
+/// True if a range is empty, or begins before its predecessor ends.
+inline static bool HasDisorder(Band const& band)
+{
+    GrRange const* range = band.items;
+    for (int left = band.item_count; left > 0; ++range) {
+        if (range->r1 >= range->r2) return true;
+        if (--left > 0 && range[1].r1 < range->r2) return true;
+    }
+    return false;
+}
+
 Band const* FirstImperfectPlain(Band const* band, Band const* end, int above)
 {
     for (; band != end; ++band) {
-        if (band->r1 < above || band->r1 >= band->r2) return band;
+        if (band->r1 < above || band->r1 >= band->r2 || HasDisorder(*band)) return band;
         above = band->r1;
-        bool disorder = false;
-        for (int i = 0; i < band->item_count; ++i)
-            disorder |= band->items[i].r1 >= band->items[i].r2;
-        for (int i = 1; i < band->item_count; ++i)
-            disorder |= band->items[i - 1].r2 > band->items[i].r1;
-        if (disorder) return band;
     }
     return end;
 }
@@ -97,8 +102,10 @@ bool VerifyBand(Band const& band)
 
 Band const* FirstImperfect(Band const* band, Band const* end, int above)
 {
-    return WideRegistersPresent() ? FirstImperfectWide(band, end, above)
-                                  : FirstImperfectPlain(band, end, above);
+    constexpr std::ptrdiff_t kFew = 24;
+    // A few bands, just written, are sooner looked at one by one than waited for.
+    return end - band > kFew && WideRegistersPresent() ? FirstImperfectWide(band, end, above)
+                                                       : FirstImperfectPlain(band, end, above);
 }
 
 /// Judges `item`, the first imperfect band, and those after it.

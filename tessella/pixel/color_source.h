@@ -12,8 +12,8 @@ struct GrPixelExtent {
     bool Meets(GrPixelExtent const& other) const { return begin < other.end && other.begin < end; }
 };
 
-/// A context to copy colours from. Those of the library's own classes give many at a time, the same that their
-/// `GetPixel` would.
+/// A context to copy colours from. Those of the library's own classes give many at a time, the same that
+/// their `GetPixel` would.
 class GrColorSource {
 public:
     explicit GrColorSource(GrContext& copied);

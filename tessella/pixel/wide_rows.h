@@ -4,7 +4,8 @@
 
 #include <type_traits>
 
-/// The loops over rows of one format, for processors with registers for `kLanes` words: 16, 8 or 4. Any thread.
+/// The loops over rows of one format, for processors with registers for `kLanes` words: 16, 8 or 4. Any
+/// thread.
 template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
 struct GrWideRows {
     /// As `BlendPixels`. Error rows are room for its own purposes.

@@ -12,8 +12,8 @@
 
 namespace {
 
-/// Compares the rows for one width of registers with those that go pixel by pixel: first on all pairs of alpha and
-/// channel and, in 16 bits, all pixels, then on random ones of all sizes.
+/// Compares the rows for one width of registers with those that go pixel by pixel: first on all pairs of
+/// alpha and channel and, in 16 bits, all pixels, then on random ones of all sizes.
 template <int kLanes, typename Surface, typename Colors>
 void JudgeRows()
 {

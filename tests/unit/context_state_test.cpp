@@ -241,6 +241,18 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
                               true},
              Case{[&] { context->FillRegion(GrRegion()); }, true},
              Case{[&] { context->DrawPixel(1, 1); }, true}, Case{[&] { context->GetPixel(1, 1); }, true},
+             Case{[&] {
+                      context->FillRegionAlpha(GrRect{1, 1, 2, 2}, 9);
+                  },
+                 true},
+             Case{[&] {
+                      context->CopyFromContext({0, 0, 1, 1}, context.get(), 0, 0);
+                  },
+                 true},
+             Case{[&] {
+                      context->DrawImageAlphaDirect({0, 0, 1, 1}, nullptr, 0, 0, {});
+                  },
+                 false},
              Case{[&] { context->DrawPixel(16, 1); }, false},
              Case{[&] { context->GetPixel(1, -1); }, false}}) {
         screenMutex.lock();

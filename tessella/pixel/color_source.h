@@ -22,8 +22,12 @@ public:
     /// of other classes nothing is known, and they are asked pixel by pixel.
     bool MayReadAhead(GrPixelExtent const& written) const { return read && !extent.Meets(written); }
 
-    /// `count` colours from context point `x`, `y` on; 0 outside the clip.
-    void Read(int x, int y, int count, GrColor* colors) const { read(source, x, y, count, colors); }
+    /// `count` colours from context point `x`, `y` on; 0 outside the clip. They are put into `room`, unless
+    /// they lie somewhere as they are.
+    GrColor const* Read(int x, int y, int count, GrColor* room) const
+    {
+        return read(source, x, y, count, room);
+    }
 
 private:
     template <typename Context>
@@ -31,5 +35,5 @@ private:
 
     GrContext& source;
     GrPixelExtent extent{};
-    void (*read)(GrContext& source, int x, int y, int count, GrColor* colors) = nullptr;
+    GrColor const* (*read)(GrContext& source, int x, int y, int count, GrColor* room) = nullptr;
 };

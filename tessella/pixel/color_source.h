@@ -1,16 +1,9 @@
 #pragma once
 
 #include <tessella/color.h>
+#include <tessella/pixel/pixel_extent.h>
 
 class GrContext;
-
-/// The addresses of some pixels, from the first to behind the last.
-struct GrPixelExtent {
-    unsigned char const* begin;
-    unsigned char const* end;
-
-    bool Meets(GrPixelExtent const& other) const { return begin < other.end && other.begin < end; }
-};
 
 /// A context to copy colours from. Those of the library's own classes give many at a time, the same that
 /// their `GetPixel` would.

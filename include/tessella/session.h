@@ -7,6 +7,8 @@
 ///
 /// The calling thread becomes the application's thread: it holds the library from now on, and the functions
 /// below are for it alone unless they say otherwise. SIGUSR1 gets a handler that does nothing, and keeps it.
+/// SIGSEGV gets one, for good, that gives the console back by `GrDone`, reports the fault on the standard
+/// error stream and aborts.
 ///
 /// The mouse device is opened, if there is one, and read on a thread of the library's own, which takes no
 /// signals. The pointer begins in the middle of the screen. All of the screen is due for paint.

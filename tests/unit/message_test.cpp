@@ -15,12 +15,6 @@
 
 namespace {
 
-std::string Contents(std::string const& path)
-{
-    std::ifstream file(path, std::ios::binary);
-    return {std::istreambuf_iterator(file), {}};
-}
-
 std::u16string MessageOf(unsigned key) { return reinterpret_cast<char16_t const*>(GetMessage(key)); }
 
 /// What translators wrote, by keys.
@@ -46,34 +40,33 @@ TEST(Messages, FollowTheLanguageAndOldTextsStay)
         memoryBundle.callsBack = true;
         std::map<unsigned short const*, std::u16string> seen;
         std::string german;
-        std::string const languages = Contents(SOURCES "locales").substr(3) + ",";
-        for (std::size_t at = 0, end = 0; (end = languages.find(',', at)) != std::string::npos;
-             at = end + 1) {
-            std::string const language = languages.substr(at, end - at);
-            SCOPED_TRACE(language);
-            std::string const& bytes = memoryBundle.loaded =
-                Contents(CATALOGUES + language + "/tessella.msg");
+        std::ifstream languages(SOURCES "locales");
+        for (std::string language; std::getline(languages, language, ',');) {
+            if (language == "en") continue;
+            std::ifstream file(CATALOGUES + language + "/tessella.msg", std::ios::binary);
+            std::string const& bytes = memoryBundle.loaded = {std::istreambuf_iterator(file), {}};
             if (language == "de") german = bytes;
-            if (memoryBundle.callback != nullptr && !seen.empty()) memoryBundle.callback();
+            if (!seen.empty()) memoryBundle.callback();
             auto const translations = Translations(SOURCES "messages/" + language + ".po");
-            EXPECT_EQ(translations.size(), 21);
+            EXPECT_EQ(translations.size(), 21) << language;
             std::u16string slots, texts;
             for (unsigned key = 0; key < 134; ++key) {
                 auto const found = translations.find(key);
                 std::u16string const text = found != translations.end() ? found->second : u"";
                 errno = 77;
-                EXPECT_TRUE(MessageOf(key) == text && errno == 77 && IsInCatalogue(GetMessage(key))) << key;
+                EXPECT_TRUE(MessageOf(key) == text && errno == 77 && IsInCatalogue(GetMessage(key)))
+                    << language << key;
                 seen[GetMessage(key)] = text;
                 slots += {static_cast<char16_t>(2 * (268 - slots.size() + texts.size())), 0};
                 texts += text + u'\0';
             }
             slots = std::u16string{static_cast<char16_t>(bytes.size()), 0, 134, 0} + slots + texts;
             EXPECT_EQ(bytes, std::string(reinterpret_cast<char*>(slots.data()), 2 * slots.size()));
-            std::unique_ptr<si_file> const file(ZipOpen("file"));
+            std::unique_ptr<si_file> const failing(ZipOpen("file"));
             memoryBundle.failing = true;
-            EXPECT_EQ(file->Size(), 0);
+            EXPECT_EQ(failing->Size(), 0);
             std::u16string told;
-            file->error.info->ops->GetMessage(file->error.info, told);
+            failing->error.info->ops->GetMessage(failing->error.info, told);
             EXPECT_EQ(told, translations.at(MessageReadFailed));
         }
         EXPECT_EQ(memoryBundle.subscriptions, 3);
@@ -105,29 +98,28 @@ TEST(Messages, FollowTheLanguageAndOldTextsStay)
 TEST(MessageCompiler, WhatIsWrongIsToldWithItsLine)
 {
     auto const folder = testing::TempDir() + "tessella-messages-" + std::to_string(getpid());
-    for (auto const& [edit, words, status, problem] : {std::tuple{"", "--output out a.po", 0, ""},
-             {R"(s/xt "86"/xt "86x"/)", "--output out a.po", 1, "a.po:66: the context is no key"},
-             {R"(s/xt "86"/xt "85"/)", "--output out a.po", 1, "a.po:62: key 85 has another English"},
-             {R"(s/xt "53"/xt "111"/)", "--output out a.po", 1, "a.po:10: the context is no key"},
-             {R"(s/msgstr "Abg.*/msgstr ""/)", "--output out a.po", 1, "a.po:22: the translation is empty"},
-             {R"(s/Abgebrochen."/Abge/)", "--output out a.po", 1, "a.po:25: end-of-line within string"},
-             {"10i #, fuzzy", "--output out a.po", 1, "a.po:11: the translation is marked"},
-             {"61,$d", "--output out a.po", 1, "a.po: key 85 is missing"},
-             {R"(s/ä/\xE4/)", "--output out a.po", 1, "invalid multibyte sequence"},
-             {R"($a msgctxt "99"\nmsgid "Error occurred while writing to the file."\nmsgstr "x")",
-                 "--output out a.po", 1, "a.po:94: duplicate message definition\n"},
+    auto const compile = "--output out a.po";
+    for (auto const& [edit, words, status, problem] : {std::tuple{"", compile, 0, ""},
+             {R"(s/xt "86"/xt "86x"/)", compile, 1, "a.po:66: the context is no key"},
+             {R"(s/xt "86"/xt "85"/)", compile, 1, "a.po:62: key 85 has another English"},
+             {R"(s/msgstr "Abg.*/msgstr ""/)", compile, 1, "a.po:22: the translation is empty"},
+             {R"(s/Abgebrochen."/Abge/)", compile, 1, "a.po:25: end-of-line within string"},
+             {"10i #, fuzzy", compile, 1, "a.po:11: the translation is marked"},
+             {"61,$d", compile, 1, "a.po: key 85 is missing"},
+             {R"(s/ä/\xE4/)", compile, 1, "invalid multibyte sequence"},
+             {R"($a msgctxt "9"\nmsgid ""\nmsgstr "x"\nmsgctxt "9"\nmsgid ""\nmsgstr "")", compile, 1,
+                 "a.po:97: duplicate message definition\n"},
              {"", "--output out none.po", 1, "none.po: cannot be read"},
              {"", "--output /dev/full a.po", 1, "/dev/full: cannot be written: No space"},
              {"", "--help", 0, "Usage: compile_messages"}, {"", "--version", 0, "compile_messages 1."},
-             {"", "a.po", 2, "--output is missing"}, {"", "a.po --output", 2, "needs the name"},
-             {"", "--output out", 2, "no translations are given"}, {"", "a.po b.po", 2, "'b.po' is one"},
-             {"", "--colour", 2, "unknown option '--colour'"}}) {
+             {"", "a.po --output", 2, "needs the name"}, {"", "--output out", 2, "no translations are given"},
+             {"", "a.po b.po", 2, "'b.po' is one"}, {"", "--colour", 2, "unknown option '--colour'"}}) {
         auto const command = "mkdir -p " + folder + " && cd " + folder + " && sed '" + edit +
             "' " SOURCES "messages/de.po >a.po && " MESSAGE_COMPILER " " + words + " 2>&1; s=$?; rm -r " +
             folder + "; exit $s";
         auto const outcome = RunChild([&] { return execl("/bin/sh", "sh", "-c", command.c_str(), nullptr); });
-        EXPECT_EQ(WEXITSTATUS(outcome.status), status) << edit << words << outcome.out;
-        EXPECT_NE(outcome.out.find(problem), std::string::npos) << edit << words << outcome.out;
+        EXPECT_TRUE(WEXITSTATUS(outcome.status) == status && outcome.out.find(problem) != std::string::npos)
+            << edit << words << outcome.out;
     }
 }
 

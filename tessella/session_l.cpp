@@ -1,5 +1,6 @@
 #include <tessella/session.h>
 
+#include <tessella/crash_l.h>
 #include <tessella/event_wait_l.h>
 #include <tessella/framebuffer_l.h>
 #include <tessella/keyboard_l.h>
@@ -25,6 +26,7 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     GrMouseStart();
     GrWindow::InitWindows();
     signal(SIGUSR1, [](int) {});  // harmless from now on, whoever sends it
+    InstallCrashHandler();
     grabMutex.lock();
     initialized = true;
     ClearScreen();

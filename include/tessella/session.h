@@ -7,6 +7,8 @@
 ///
 /// The calling thread becomes the application's thread: it holds the library from now on, and the functions
 /// below are for it alone unless they say otherwise. SIGUSR1 gets a handler that does nothing, and keeps it.
+/// SIGSEGV gets one, for good, that gives the console back by `GrDone`, reports the fault on the standard
+/// error stream and aborts.
 ///
 /// The console is taken: its keyboard gives key codes, read on a thread of the library's own, the terminal
 /// passes bytes on as they are, and the kernel keeps its text off the screen. SIGUSR2 gets the handler for

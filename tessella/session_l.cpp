@@ -2,6 +2,7 @@
 
 #include <tessella/event_wait_l.h>
 #include <tessella/framebuffer_l.h>
+#include <tessella/keyboard_l.h>
 #include <tessella/mouse.h>
 #include <tessella/session_state.h>
 #include <tessella/vga_l.h>
@@ -18,6 +19,7 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     sessionThread = pthread_self();
     if (!OpenFramebuffer()) return false;
     RequestVgaPorts();
+    GrKeyboardCreate();
     if (!GrSetVideoMode(width, height, depth, mode)) return false;
     screenVisible = true;
     GrMouseStart();
@@ -34,6 +36,7 @@ void GrDone()
     if (!initialized) return;
     ClearScreen();
     GrMouseStop();
+    GrKeyboardDestroy();
     GrWindow::ShutdownWindows();
     DeleteScreenContext();
     CloseFramebuffer();

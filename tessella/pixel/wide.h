@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <cstring>
 
-#ifdef __AVX2__
+#ifdef __x86_64__
 #include <immintrin.h>
 #endif
 
@@ -75,17 +75,24 @@ struct GrWide : GrWideVectors<kLaneCount> {
     /// The word's halves exchanged.
     GR_INLINE static Words Turned(Words const& words) { return words << 16 | words >> 16; }
 
-    /// Each channel times a factor, / 256.
-    GR_INLINE static Channels Scaled(Channels const& channels, Words const& factors)
+    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is all
+    /// that is needed.
+    GR_INLINE static Halves Factors(Words const& factors)
     {
-        Halves const both = (Halves)(factors | factors << 16);
-        return {(Words)((Halves)channels.redBlue * both >> 8), (Words)((Halves)channels.green * both >> 8)};
+        Words const upper = factors << 8;
+        return (Halves)(upper | upper << 16);
+    }
+
+    /// Each channel times a factor, / 256.
+    GR_INLINE static Channels Scaled(Channels const& channels, Halves const& factors)
+    {
+        return {UpperProducts(channels.redBlue, factors), UpperProducts(channels.green, factors)};
     }
 
     /// `Mixed` of the colours: ninth bits spill into the next channel here, too.
-    GR_INLINE static Words Mixed(Channels const& source, Channels const& destination, Words const& alphas)
+    GR_INLINE static Words Mixed(Channels const& source, Channels const& destination, Halves const& alphas)
     {
-        Channels const rest = Scaled(destination, 255 - alphas);
+        Channels const rest = Scaled(destination, alphas ^ 0xFF00);
         return (source.redBlue + rest.redBlue) | (source.green + rest.green) << 8 | 0xFF000000;
     }
 
@@ -198,6 +205,21 @@ struct GrWide : GrWideVectors<kLaneCount> {
     }
 
 private:
+    GR_INLINE static Words UpperProducts(Words const& a, Halves const& b)
+    {
+#if defined __AVX512BW__
+        if constexpr (kLanes == 16) return (Words)_mm512_mulhi_epu16((__m512i)a, (__m512i)b);
+#endif
+#if defined __AVX2__
+        if constexpr (kLanes == 8) return (Words)_mm256_mulhi_epu16((__m256i)a, (__m256i)b);
+#endif
+#if defined __x86_64__
+        if constexpr (kLanes == 4) return (Words)_mm_mulhi_epu16((__m128i)a, (__m128i)b);
+#endif
+        // One of the factors has nothing in its lower half.
+        return (Words)((Halves)a * (b >> 8) >> 8);
+    }
+
     template <typename Part>
     GR_INLINE static Words LoadFirst(unsigned char const* from, int count)
     {

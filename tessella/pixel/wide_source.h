@@ -54,9 +54,10 @@ struct WideSource {
     /// The colours over pixels of the target. They mean something only where the alpha is neither 0 nor 255.
     GR_INLINE Words MixedOver(Words const& pixels) const
     {
+        auto const factors = W::Factors(alpha);
         typename W::Channels channels = W::Split(color);
-        if constexpr (!kHasColors || !kHasAlphas) channels = W::Scaled(channels, alpha);
-        return W::Mixed(channels, Format::Split(pixels), alpha);
+        if constexpr (!kHasColors || !kHasAlphas) channels = W::Scaled(channels, factors);
+        return W::Mixed(channels, Format::Split(pixels), factors);
     }
 
     GrBlend const blend;  // a copy: no store can change it

@@ -1,3 +1,5 @@
+#include <algorithm>
+#include <limits>
 #include <span>
 
 inline GrBits BitsOf(GrGlyphInfo const& glyph)
@@ -15,24 +17,99 @@ struct GrGlyphImage : GrImage {
     ~GrGlyphImage() { Detach(); }
 };
 
+/// The back colour in the cells of an opaque text, where no glyph's box is. As long as boxes follow each other
+/// without meeting, and no box reaches beyond the pen behind it, three rectangles beside each are all. Others
+/// are cut out of a region of gaps, until the pen has passed them all.
+template <typename S>
+class GrGenericContextBase<S>::TextBack {
+public:
+    TextBack(GrGenericContextBase& drawnContext, int pen, int cellTop, int cellBottom, bool isBold)
+        : context(drawnContext), top(cellTop), bottom(cellBottom), painted(pen), reach(pen), bold(isBold)
+    {}
+
+    /// The glyph in `box` has been drawn, and the pen is behind it now.
+    void Pass(GrRect const& box, int pen)
+    {
+        if (box.IsEmpty()) return;
+        // What makes a glyph bold may leave pixels of its box alone, or hit the gaps of others: then the gaps
+        // come last.
+        if (!hasGaps && !bold && box.x1 >= painted && box.x2 <= pen) {
+            Fill({painted, top, box.x1, bottom});
+            Fill({box.x1, top, box.x2, std::min(box.y1, bottom)});
+            Fill({box.x1, std::max(box.y2, top), box.x2, bottom});
+            painted = reach = box.x2;
+            return;
+        }
+        if (!hasGaps) CutRegion(gaps.Get(), context.clip, GrRect{painted, top, kFarRight, bottom});
+        hasGaps = true;
+        gaps.Get() -= box;
+        reach = std::max(reach, box.x2);
+        if (!bold && reach <= pen) FillGaps(reach);
+    }
+
+    /// What lies behind the last pen stays as it is.
+    void End(int pen)
+    {
+        if (hasGaps)
+            FillGaps(pen);
+        else
+            Fill({painted, top, pen, bottom});
+    }
+
+private:
+    static constexpr int kFarRight = std::numeric_limits<int>::max();
+
+    void Fill(GrRect const& rect)
+    {
+        if (rect.IsEmpty()) return;
+        context.WalkClip(
+            rect, 0, 0, [&](GrRange columns, GrRange rows, int, int) { FillRange(columns, rows); });
+    }
+
+    void FillGaps(int end)
+    {
+        GrRegion& region = gaps.Get();
+        region -= GrRect{end, top, kFarRight, bottom};
+        painted = end;
+        hasGaps = false;
+        if (!region) return;
+        typename S::Guard const guard(region);
+        if (!context.HasPixels()) return;
+        for (auto const& band : BandsOf(region))
+            for (auto const& range : RangesOf(band))
+                FillRange(range, {band.r1, band.r2});
+    }
+
+    void FillRange(GrRange const& columns, GrRange const& rows)
+    {
+        context.FillRows({context.PixelAddress(context.RowAddress(rows.r1), columns.r1), context.Stride(),
+                             columns.r2 - columns.r1, rows.r2 - rows.r1},
+            context.backColor);
+    }
+
+    GrGenericContextBase& context;
+    int const top, bottom;  ///< of the cells
+    int painted;            ///< all of the cells left of here is, but for the gaps
+    int reach;              ///< the right edge of the boxes so far
+    bool const bold;
+    bool hasGaps = false;
+    LocalRegion const gaps;  ///< from `painted` on
+};
+
 template <typename S>
 template <typename Character>
 void GrGenericContextBase<S>::DrawCharacters(
     int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent)
 {
     if (!font.IsValid()) return;
-    bool const embolden = static_cast<GrFontBase&>(font).embolden;
+    bool const bold = static_cast<GrFontBase&>(font).embolden;
     int pen = Moved(x, this->originX);
     int const baseline = Moved(y, this->originY);
     int const top = SeenFrom(baseline, static_cast<int>(font.GetAscent()));
-    int const bottom = Moved(top, static_cast<int>(font.GetHeight()));
-    constexpr int kFarRight = std::numeric_limits<int>::max();
 
     // Held for the whole string, over nothing: the cursor only goes where glyphs land.
     typename S::Guard const guard(GrRect{});
-    LocalRegion const cell;  // what of it no glyph's box covers
-    GrRegion& gaps = cell.Get();
-    if (!transparent) CutRegion(gaps, this->clip, GrRect{pen, top, kFarRight, bottom});
+    TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), bold);
     GrGlyphInfo glyph;
     unsigned previous = 0;
     for (unsigned const code : std::span(text, length)) {
@@ -40,18 +117,16 @@ void GrGenericContextBase<S>::DrawCharacters(
             int const left = Moved(pen, glyph.left), glyphTop = SeenFrom(baseline, glyph.top);
             GrRect box{left, glyphTop, Moved(left, static_cast<int>(glyph.width)),
                 Moved(glyphTop, static_cast<int>(glyph.rows))};
-            pen = Moved(pen, static_cast<int>(glyph.advance) + embolden);
+            pen = Moved(pen, static_cast<int>(glyph.advance) + bold);
             int shift[2];
             if (previous != 0 && font.GetKerning(shift, code, previous)) box = Moved(box, shift[0], shift[1]);
-            if (!transparent) gaps -= GrRect{box.x1, box.y1, Moved(box.x2, embolden), box.y2};
             StrikeGlyph(box, glyph, transparent);
-            if (embolden) Embolden(box, glyph, transparent);
+            if (bold) Embolden(box, glyph, transparent);
+            if (!transparent) back.Pass({box.x1, box.y1, Moved(box.x2, bold), box.y2}, pen);
         }
         previous = code;
     }
-    if (transparent) return;
-    gaps -= GrRect{pen, top, kFarRight, bottom};
-    if (gaps) FillBack(gaps);
+    if (!transparent) back.End(pen);
 }
 
 template <typename S>
@@ -74,16 +149,4 @@ void GrGenericContextBase<S>::Embolden(GrRect const& box, GrGlyphInfo const& gly
             });
     }
     StrikeGlyph(Moved(box, 1, 0), glyph, true);
-}
-
-template <typename S>
-void GrGenericContextBase<S>::FillBack(GrRegion const& region) const
-{
-    typename S::Guard const guard(region);
-    if (!this->HasPixels()) return;
-    for (auto const& band : BandsOf(region))
-        for (auto const& range : RangesOf(band))
-            this->FillRows({this->PixelAddress(this->RowAddress(band.r1), range.r1), this->Stride(),
-                               range.r2 - range.r1, band.r2 - band.r1},
-                this->backColor);
 }

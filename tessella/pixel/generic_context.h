@@ -91,12 +91,12 @@ private:
     template <typename Walker>
     void FillLines(GrRegion const& region, Walker& walker) const;
 
+    class TextBack;
     template <typename Character>
     void DrawCharacters(int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent);
     /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; and once more, a pixel beside it.
     void StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
     void Embolden(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
-    void FillBack(GrRegion const& region) const;
 };
 
 /// The drawing operations that convert between colours and pixels.

@@ -1,6 +1,6 @@
 template <typename S>
 template <typename Visit>
-void GrGenericContextBase<S>::WalkClip(GrRect const& target, int sx, int sy, Visit visit)
+void GrGenericContextBase<S>::WalkClip(GrRect const& target, int sx, int sy, Visit const& visit)
 {
     // Nearly always, and needs no region of its own.
     if (IsOneRectangle(this->clip)) {
@@ -8,7 +8,7 @@ void GrGenericContextBase<S>::WalkClip(GrRect const& target, int sx, int sy, Vis
         GrRange const columns{std::max(band.items[0].r1, target.x1), std::min(band.items[0].r2, target.x2)};
         GrRange const rows{std::max(band.r1, target.y1), std::min(band.r2, target.y2)};
         GrRect const local{columns.r1, rows.r1, columns.r2, rows.r2};
-        typename S::Guard const guard(local);
+        typename S::WalkGuard const guard(*this, local);
         if (!local.IsEmpty() && this->HasPixels())
             visit(columns, rows, SourceOf(sx, columns.r1, target.x1), SourceOf(sy, rows.r1, target.y1));
         return;
@@ -16,7 +16,7 @@ void GrGenericContextBase<S>::WalkClip(GrRect const& target, int sx, int sy, Vis
     LocalRegion const cut;
     GrRegion& local = cut.Get();
     CutRegion(local, this->clip, target);
-    typename S::Guard const guard(local);
+    typename S::WalkGuard const guard(*this, local);
     if (!this->HasPixels()) return;
     for (auto const& band : BandsOf(local))
         for (auto const& range : RangesOf(band))

@@ -73,7 +73,7 @@ private:
         painted = end;
         hasGaps = false;
         if (!region) return;
-        typename S::Guard const guard(region);
+        typename S::WalkGuard const guard(context, region);
         if (!context.HasPixels()) return;
         for (auto const& band : BandsOf(region))
             for (auto const& range : RangesOf(band))
@@ -107,8 +107,7 @@ void GrGenericContextBase<S>::DrawCharacters(
     int const baseline = Moved(y, this->originY);
     int const top = SeenFrom(baseline, static_cast<int>(font.GetAscent()));
 
-    // Held for the whole string, over nothing: the cursor only goes where glyphs land.
-    typename S::Guard const guard(GrRect{});
+    typename S::TextGuard const guard(*this);
     TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), bold);
     GrGlyphInfo glyph;
     unsigned previous = 0;

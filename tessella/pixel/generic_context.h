@@ -64,7 +64,7 @@ protected:
     /// `visit` gets the range's columns and rows and the source point that goes to its top left, while `sx`,
     /// `sy` goes to that of the target.
     template <typename Visit>
-    void WalkClip(GrRect const& target, int sx, int sy, Visit visit);
+    void WalkClip(GrRect const& target, int sx, int sy, Visit const& visit);
 
     /// False for rectangles that select no pixel, or where there are none.
     bool HasPixelsIn(GrRect const& rect) const { return !rect.IsEmpty() && this->HasPixels(); }

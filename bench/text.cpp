@@ -270,28 +270,31 @@ void TextRow::AddSdl()
 void AddRows()
 {
     hideCount = 0;  // as in a session with a pointer: the lock is taken
-    static Surface screen32(kScreenWidth, 32), screen16(kScreenWidth, 16);
     static Letters bits(false, false), grey(true, false);
     static Letters proportionalBits(false, true), proportionalGrey(true, true);
-
-    TextRow transparent("1-bit text, transparent, 32 bits", screen32, bits, true);
-    transparent.AddOurs();
-    transparent.AddPixman();
-    TextRow proportional("1-bit text, proportional, transparent, 32 bits", screen32, proportionalBits, true);
-    proportional.AddOurs();
-    proportional.AddPixman();
-    TextRow opaque("1-bit text, opaque, 32 bits", screen32, bits, false);
-    opaque.AddOurs();
-    opaque.AddSdl();
-    for (Letters* const font : {&grey, &proportionalGrey})
-        for (Surface* const screen : {&screen32, &screen16}) {
-            TextRow row(std::string("grey text, ") + (font == &grey ? "8x16, " : "proportional, ") +
-                    std::to_string(screen->Bits()) + " bits",
-                *screen, *font, true);
+    static Surface screens[] = {
+        {kScreenWidth, 32}, {kScreenWidth, 16}, {kScreenWidth + 16, 32}, {kScreenWidth + 16, 16}};
+    for (Surface& screen : screens) {
+        std::string const format = ", " + std::to_string(screen.Bits()) + " bits, width " +
+            std::to_string(screen.Stride() / screen.Bytes());
+        for (Letters* const letters : {&grey, &proportionalGrey}) {
+            TextRow row((letters == &grey ? "grey text, 8x16" : "grey text, proportional") + format, screen,
+                *letters, true);
             row.AddOurs();
-            if (screen == &screen32)
+            if (screen.Bits() == 32)
                 row.AddPixman();
             else
                 row.AddSdl();
         }
+        if (screen.Bits() == 16) continue;
+        for (Letters* const letters : {&bits, &proportionalBits}) {
+            TextRow row((letters == &bits ? "1-bit text, transparent" : "1-bit text, proportional") + format,
+                screen, *letters, true);
+            row.AddOurs();
+            row.AddPixman();
+        }
+        TextRow row("1-bit text, opaque" + format, screen, bits, false);
+        row.AddOurs();
+        row.AddSdl();
+    }
 }

@@ -129,7 +129,8 @@ void GrGenericContextBase<S>::DrawCharacters(
 }
 
 template <typename S>
-void GrGenericContextBase<S>::StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
+inline void GrGenericContextBase<S>::StrikeGlyph(
+    GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
 {
     if (glyph.bitsPerPixel == 1) return DrawBits(box.x1, box.y1, BitsOf(glyph), transparent);
     GrGlyphImage const image(glyph);

@@ -2,6 +2,7 @@
 
 #include <tessella/crash_l.h>
 #include <tessella/event_wait_l.h>
+#include <tessella/font_factory.h>
 #include <tessella/framebuffer_l.h>
 #include <tessella/keyboard_l.h>
 #include <tessella/mouse.h>
@@ -22,6 +23,7 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     RequestVgaPorts();
     GrKeyboardCreate();
     if (!GrSetVideoMode(width, height, depth, mode)) return false;
+    LoadFontTable();
     screenVisible = true;
     GrMouseStart();
     GrWindow::InitWindows();

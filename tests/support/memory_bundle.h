@@ -1,11 +1,12 @@
 #pragma once
 
 #include <atomic>
+#include <map>
 #include <string>
 
-/// The resource service of test programs that link its twin in memory: an archive of one file, "file", which
-/// holds "data".
+/// The resource service of test programs that link its twin in memory.
 struct MemoryBundle {
+    std::map<std::string, std::string> files = {{"file", "data"}};
     bool hasArchive = true;
     bool failing = false;  ///< every operation on an open file fails, after reading one byte
     std::string failure;   ///< the error chain that it tells, if any

@@ -2,6 +2,7 @@
 
 #include <tessella/event_wait_l.h>
 #include <tessella/font_factory.h>
+#include <tessella/font_substitution.h>
 #include <tessella/framebuffer_l.h>
 #include <tessella/mouse.h>
 #include <tessella/session_state.h>
@@ -38,6 +39,7 @@ void GrDone()
     GrMouseStop();
     GrWindow::ShutdownWindows();
     DeleteScreenContext();
+    ReleaseFontTable();
     CloseFramebuffer();
     grabMutex.unlock();
     initialized = false;

@@ -55,8 +55,8 @@ private:
     std::map<std::uint32_t, std::string> names;
 };
 
-/// An element is its name, a byte with the number of attributes, these, the number of texts, and these, with a
-/// child between each two.
+/// An element is its name, a byte with the number of attributes, these, the number of texts, and these, with
+/// a child between each two.
 class xml_reader_binary_old final : public xml_reader_core {
 public:
     using xml_reader_core::xml_reader_core;
@@ -68,7 +68,8 @@ private:
     std::uint32_t ReadStart();
 };
 
-/// An element is its name, its attributes with an end mark, and a text before each child and before an end mark.
+/// An element is its name, its attributes with an end mark, and a text before each child and before an end
+/// mark.
 class xml_reader_binary_new final : public xml_reader_core {
 public:
     using xml_reader_core::xml_reader_core;

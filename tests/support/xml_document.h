@@ -6,7 +6,8 @@
 #include <filesystem>
 #include <random>
 
-/// A random document that knows its tree: whitespace leaves marks, which are dealt with where a text is complete.
+/// A random document that knows its tree: whitespace leaves marks, which are dealt with where a text is
+/// complete.
 class XmlDocument {
 public:
     explicit XmlDocument(unsigned seed) : random(seed)

@@ -142,7 +142,7 @@ TEST(Xml, OnlyCharactersInTheirShortestForm)
 TEST(Xml, OddBinaryFiles)
 {
     std::pair<std::string, Parsed> const cases[] = {
-        // More bits than 32 are lost. The first of two values stays; names may have the number 0 in the old form.
+        // More bits than 32 are lost, which makes a name of number 0. The first of two values stays.
         {"\1\7\x80\x80\x80\x80\x70\1x\2\1\1a\1\x31\1\1\x32\1\2\xC3\xA4", {true, 1, 1, "x(a=1||#228)"}},
         {"\2\7\1\1x\2\1a\2\x31\2\2\x32\0\4\xC3\xA4\1\0\3r\0\2z\0"s, {true, 1, 1, "x(a=1||#228x(|)|z)"}},
         {"\2\7\0behind the end"s, {true, 1, 1, "none"}}, {"\3\7\1\1x\0\1\0"s, {false, 1, 1, "none"}},

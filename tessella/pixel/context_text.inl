@@ -33,9 +33,9 @@ void GrGenericContextBase<S>::DrawCharacters(
     LocalRegion const cell;  // what of it no glyph's box covers
     GrRegion& gaps = cell.Get();
     if (!transparent) CutRegion(gaps, this->clip, GrRect{pen, top, kFarRight, bottom});
+    GrGlyphInfo glyph;
     unsigned previous = 0;
     for (unsigned const code : std::span(text, length)) {
-        GrGlyphInfo glyph;
         if (font.GetGlyph(code, glyph)) {
             int const left = Moved(pen, glyph.left), glyphTop = SeenFrom(baseline, glyph.top);
             GrRect box{left, glyphTop, Moved(left, static_cast<int>(glyph.width)),
@@ -44,7 +44,8 @@ void GrGenericContextBase<S>::DrawCharacters(
             int shift[2];
             if (previous != 0 && font.GetKerning(shift, code, previous)) box = Moved(box, shift[0], shift[1]);
             if (!transparent) gaps -= GrRect{box.x1, box.y1, Moved(box.x2, embolden), box.y2};
-            StrikeGlyph(box, glyph, transparent, embolden);
+            StrikeGlyph(box, glyph, transparent);
+            if (embolden) Embolden(box, glyph, transparent);
         }
         previous = code;
     }
@@ -54,28 +55,25 @@ void GrGenericContextBase<S>::DrawCharacters(
 }
 
 template <typename S>
-void GrGenericContextBase<S>::StrikeGlyph(
-    GrRect box, GrGlyphInfo const& glyph, bool transparent, bool embolden)
+void GrGenericContextBase<S>::StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
 {
-    bool const isGrey = glyph.bitsPerPixel != 1;
-    if (isGrey)
-        box = {SeenFrom(box.x1, this->originX), SeenFrom(box.y1, this->originY),
-            SeenFrom(box.x2, this->originX), SeenFrom(box.y2, this->originY)};
-    auto const strike = [&](int x, bool overDestination) {
-        if (!isGrey) return DrawBits(x, box.y1, BitsOf(glyph), overDestination);
-        GrGlyphImage const image(glyph);
-        GrRect const at{x, box.y1, Moved(x, image.width), box.y2};
-        this->DrawImageAlpha(at, &image, 0, 0, {overDestination, false, false, 0});
-    };
-    strike(box.x1, transparent);
-    if (!embolden) return;
-    // The column of a grey glyph stands where its context coordinates say on the surface.
-    if (!transparent)
-        WalkClip(
-            {box.x2, box.y1, Moved(box.x2, 1), box.y2}, 0, 0, [&](GrRange columns, GrRange rows, int, int) {
+    if (glyph.bitsPerPixel == 1) return DrawBits(box.x1, box.y1, BitsOf(glyph), transparent);
+    GrGlyphImage const image(glyph);
+    this->DrawImageAlpha(InContext(box), &image, 0, 0, {transparent, false, false, 0});
+}
+
+template <typename S>
+void GrGenericContextBase<S>::Embolden(GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
+{
+    if (!transparent) {
+        // The column of a grey glyph stands where its context coordinates say on the surface.
+        GrRect const beside = glyph.bitsPerPixel == 1 ? box : InContext(box);
+        WalkClip({beside.x2, beside.y1, Moved(beside.x2, 1), beside.y2}, 0, 0,
+            [&](GrRange columns, GrRange rows, int, int) {
                 this->PatternColumn(columns.r1, rows.r1, rows.r2 - rows.r1, this->backColor, this->backColor);
             });
-    strike(Moved(box.x1, 1), true);
+    }
+    StrikeGlyph(Moved(box, 1, 0), glyph, true);
 }
 
 template <typename S>

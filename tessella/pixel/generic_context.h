@@ -1,10 +1,10 @@
 #pragma once
 
 #include <common/assert.h>
-#include <tessella/bitmap.h>
 #include <tessella/coordinates.h>
 #include <tessella/font.h>
 #include <tessella/pixel/arc.h>
+#include <tessella/pixel/bits_rows.h>
 #include <tessella/pixel/blend_rows.h>
 #include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/color_source.h>
@@ -15,29 +15,6 @@
 #include <tessella/pixel/line_walker.h>
 #include <tessella/pixel/polygon_walker.h>
 #include <tessella/region_cut.h>
-
-/// A picture of one bit a pixel. Its rows begin `pitch` bytes apart, the leftmost pixel in the highest or the
-/// lowest bit of a byte; or, with a pitch of 0, follow each other bit by bit, always the lowest first.
-struct GrBits {
-    std::uint8_t const* data;
-    int width, height;
-    int pitch;
-    bool msbFirst;
-
-    bool IsSet(int row, int column) const
-    {
-        std::ptrdiff_t const index = pitch == 0 ? std::ptrdiff_t{row} * width + column
-            : msbFirst                          ? column ^ 7
-                                                : column;
-        return data[std::ptrdiff_t{row} * pitch + index / 8] >> index % 8 & 1;
-    }
-};
-
-inline GrBits BitsOf(GrBitmap const& bitmap)
-{
-    int const pitch = static_cast<int>((static_cast<unsigned>(bitmap.width) + 7) / 8);
-    return {bitmap.data, bitmap.width, bitmap.height, pitch, false};
-}
 
 /// The drawing operations that move pixel values converted once, when the colour was set. `S` is the surface
 /// layer: where the pixels lie, and how wide they are.
@@ -77,6 +54,11 @@ protected:
     using S::S;
 
     GrRect OnSurface(GrRect const& rect) const { return Moved(rect, this->originX, this->originY); }
+    GrRect InContext(GrRect const& rect) const
+    {
+        return {SeenFrom(rect.x1, this->originX), SeenFrom(rect.y1, this->originY),
+            SeenFrom(rect.x2, this->originX), SeenFrom(rect.y2, this->originY)};
+    }
 
     /// Visits the clip within `target` (surface coordinates), range by range, with the screen's guard held:
     /// `visit` gets the range's columns and rows and the source point that goes to its top left, while `sx`,
@@ -111,9 +93,9 @@ private:
 
     template <typename Character>
     void DrawCharacters(int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent);
-    /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; once more one pixel to the right if
-    /// it is to be bold.
-    void StrikeGlyph(GrRect box, GrGlyphInfo const& glyph, bool transparent, bool embolden);
+    /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; and once more, a pixel beside it.
+    void StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
+    void Embolden(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
     void FillBack(GrRegion const& region) const;
 };
 

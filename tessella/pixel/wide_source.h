@@ -30,10 +30,10 @@ struct WideSource {
         std::ptrdiff_t const index = y * blend.sourceWidth + x;
         if constexpr (kHasColors) color = W::template Load<std::uint32_t>(blend.colors + index * 4, count);
         if constexpr (kHasAlphas) {
-            unsigned char few[W::kLanes] = {};
+            unsigned char few[W::kLanes];
             unsigned char const* alphas = blend.alphas + index;
             if (count < W::kLanes) [[unlikely]] {
-                std::memcpy(few, alphas, static_cast<std::size_t>(count));
+                W::CopyFirst(few, alphas, count);
                 alphas = few;
             }
             using Some = std::conditional_t < W::kLanes<8, std::uint32_t, std::uint64_t>;

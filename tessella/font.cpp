@@ -19,6 +19,7 @@ void LoadFontTable()
 {
     ReadFontTable();
     RegisterFontFactory(GrFontTypeCgf, [](GrFontDesc const& desc) -> GrFont* { return new GrFontCGF(desc); });
+    GrEnableFreeType();
 }
 
 GrFont* GrFont::Create(

@@ -3,6 +3,7 @@
 #include <tessella/crash_l.h>
 #include <tessella/event_wait_l.h>
 #include <tessella/font_factory.h>
+#include <tessella/font_substitution.h>
 #include <tessella/framebuffer_l.h>
 #include <tessella/keyboard_l.h>
 #include <tessella/mouse.h>
@@ -43,6 +44,7 @@ void GrDone()
     GrKeyboardDestroy();
     GrWindow::ShutdownWindows();
     DeleteScreenContext();
+    ReleaseFontTable();
     CloseFramebuffer();
     grabMutex.unlock();
     initialized = false;

@@ -1,6 +1,7 @@
 #include <tessella/session.h>
 
 #include <tessella/event_wait_l.h>
+#include <tessella/font_factory.h>
 #include <tessella/framebuffer_l.h>
 #include <tessella/mouse.h>
 #include <tessella/session_state.h>
@@ -19,6 +20,7 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     if (!OpenFramebuffer()) return false;
     RequestVgaPorts();
     if (!GrSetVideoMode(width, height, depth, mode)) return false;
+    LoadFontTable();
     screenVisible = true;
     GrMouseStart();
     GrWindow::InitWindows();

@@ -3,6 +3,7 @@
 #include <common/assert.h>
 #include <tessella/bitmap.h>
 #include <tessella/coordinates.h>
+#include <tessella/font.h>
 #include <tessella/pixel/arc.h>
 #include <tessella/pixel/blend_rows.h>
 #include <tessella/pixel/clip_walk.h>
@@ -53,6 +54,16 @@ public:
     void DrawArc(int x, int y, int w, int h, int start, int sweep) override;
     void FillArc(int x, int y, int w, int h, int start, int sweep) override;
     void FillPolygon(std::int16_t const xy[], unsigned count) override;
+    void DrawText(
+        int x, int y, unsigned char const* text, unsigned length, GrFont* font, bool transparent) override
+    {
+        DrawCharacters(x, y, text, length, *font, transparent);
+    }
+    void DrawTextW(
+        int x, int y, unsigned short const* text, unsigned length, GrFont* font, bool transparent) override
+    {
+        DrawCharacters(x, y, text, length, *font, transparent);
+    }
     void DrawBitmap(int x, int y, GrBitmap const& bitmap) override;
     void DrawBitmapTransparent(int x, int y, GrBitmap const& bitmap) override;
     void DrawImageMasked(
@@ -97,6 +108,13 @@ private:
     /// The same with all lines that `walker` gives, one in each row.
     template <typename Walker>
     void FillLines(GrRegion const& region, Walker& walker) const;
+
+    template <typename Character>
+    void DrawCharacters(int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent);
+    /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; once more one pixel to the right if
+    /// it is to be bold.
+    void StrikeGlyph(GrRect box, GrGlyphInfo const& glyph, bool transparent, bool embolden);
+    void FillBack(GrRegion const& region) const;
 };
 
 /// The drawing operations that convert between colours and pixels.
@@ -143,3 +161,4 @@ private:
 #include <tessella/pixel/context_convert.inl>
 #include <tessella/pixel/context_fill.inl>
 #include <tessella/pixel/context_shapes.inl>
+#include <tessella/pixel/context_text.inl>

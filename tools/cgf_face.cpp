@@ -18,8 +18,8 @@ constexpr FT_Pos kPixel = 64;  // FreeType's unit of lengths is a 64th of one
 
 }
 
-void Face::Close::operator()(FT_LibraryRec_* library) const { FT_Done_FreeType(library); }
-void Face::Close::operator()(FT_FaceRec_* face) const { FT_Done_Face(face); }
+void Face::Close::operator()(FT_LibraryRec_* opened) const { FT_Done_FreeType(opened); }
+void Face::Close::operator()(FT_FaceRec_* opened) const { FT_Done_Face(opened); }
 
 Face::Face(std::string const& itsPath, unsigned size) : path(itsPath)
 {

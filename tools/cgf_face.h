@@ -31,8 +31,8 @@ public:
 
 private:
     struct Close {
-        void operator()(FT_LibraryRec_* library) const;
-        void operator()(FT_FaceRec_* face) const;
+        void operator()(FT_LibraryRec_* opened) const;
+        void operator()(FT_FaceRec_* opened) const;
     };
 
     void Check(int error) const;

@@ -110,7 +110,7 @@ int Render(Painting const& painting, std::string const& path, std::string const&
 std::string Next(std::span<char*>& words, std::string const& what)
 {
     if (words.empty()) throw UsageError(what + " is missing");
-    std::string const word = words.front();
+    std::string word = words.front();
     words = words.subspan(1);
     return word;
 }

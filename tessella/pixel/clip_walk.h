@@ -16,3 +16,8 @@ inline std::span<GrRange const> RangesOf(GrRegion::Band const& band)
 {
     return {band.items, static_cast<std::size_t>(band.item_count)};
 }
+
+inline bool IsOneRectangle(GrRegion const& region)
+{
+    return region.bands.item_count == 1 && region.bands.items[0].item_count == 1;
+}

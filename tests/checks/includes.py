@@ -17,7 +17,7 @@ NEVER = [
      rf"(?!include/tessella/(region|types|export)\.h|tessella/coordinates\.h|include/common/assert\.h"
      rf"|tessella/region|{CXX_LIBRARY}|<immintrin\.h>).*",
      "a region knows coordinates and assertions only"),
-    (r"tessella/pixel/.*", r"(include/)?tessella/(window|event|mouse|keyboard|key_layout|cursor|font|cgf|session_(l|state)).*",
+    (r"tessella/pixel/.*", r"(include/)?tessella/(window|event|mouse|keyboard|key_layout|cursor|font_|cgf|session_(l|state)).*",
      "a context knows a region, not who wants it"),
     (r"(include/)?tessella/(?!pixel/|video_mode|image).*", r"tessella/pixel/.*",
      "only the mode's two factories know pixel formats"),

@@ -24,7 +24,8 @@ void JudgeRows()
     std::mt19937 random(std::random_device{}());
     for (unsigned round = 0; round < 150; ++round) {
         bool const all = round == 0;
-        unsigned const width = all ? 256 : 1 + random() % 300, height = all ? 256 : 1 + random() % 35;
+        unsigned const width = all ? 256 : 1 + random() % (round % 2 ? 300 : 20),
+                       height = all ? 256 : 1 + random() % 35;
         std::size_t const area = width * height;
         std::vector<unsigned char> target(area * Surface::kBytes), alphas(area), written(target);
         std::vector<GrColor> colors(area), read(area);
@@ -84,6 +85,52 @@ TEST(WideRows, GiveTheSamePixelsAsOneByOne)
     JudgeWideRows<GrSurface24, GrColors24>();
     JudgeWideRows<GrSurface32, GrColors24>();
     JudgeWideRows<GrSurface32, GrColorsRGB>();
+}
+
+template <int kLanes, typename Surface>
+void JudgeBits()
+{
+    if (WideLanes() < kLanes) return;
+    std::mt19937 random(std::random_device{}());
+    auto const number = [&](int below) { return static_cast<int>(random() % static_cast<unsigned>(below)); };
+    for (int round = 0; round < 500; ++round) {
+        GrBits bits{nullptr, 1 + number(round % 2 ? 80 : 12), 1 + number(20), 0, number(2) != 0};
+        if (number(2)) bits.pitch = (bits.width + 7) / 8 + number(3);
+        int const last =
+            bits.pitch ? (bits.height - 1) * bits.pitch * 8 + bits.width : bits.width * bits.height;
+        std::vector<unsigned char> data(static_cast<std::size_t>(last + 7) / 8), actual(30000),
+            expected(actual);
+        for (auto& byte : data)
+            byte = static_cast<unsigned char>(random());
+        bits.data = data.data();
+        int const column = number(bits.width), row = number(bits.height), stride = 90 * Surface::kBytes + 1;
+        GrBitsBox const box{{actual.data(), stride, bits.width - column, bits.height - row}, bits, column,
+            row, static_cast<typename Surface::Pixel>(random()),
+            static_cast<typename Surface::Pixel>(random()), number(2) != 0};
+        for (int y = row; y < bits.height; ++y)
+            for (int x = column; x < bits.width; ++x)
+                if (bits.IsSet(y, x) || !box.transparent)
+                    Surface::WritePixel(expected.data() + (y - row) * stride, x - column,
+                        static_cast<typename Surface::Pixel>(bits.IsSet(y, x) ? box.fore : box.back));
+        GrWideBits<kLanes, Surface>::Paint(box);
+        ASSERT_EQ(actual, expected) << kLanes << " lanes of " << Surface::kBytes;
+    }
+}
+
+template <typename Surface>
+void JudgeWideBits()
+{
+    JudgeBits<4, Surface>();
+    JudgeBits<8, Surface>();
+    JudgeBits<16, Surface>();
+}
+
+TEST(WideRows, PaintTheBitsOfABoxAndNothingBeside)
+{
+    JudgeWideBits<GrSurface8>();
+    JudgeWideBits<GrSurface16>();
+    JudgeWideBits<GrSurface24>();
+    JudgeWideBits<GrSurface32>();
 }
 
 struct Picture {

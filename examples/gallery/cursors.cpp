@@ -108,6 +108,7 @@ std::unique_ptr<GrCursor> NewCursor(int index)
 void DrawCursors(Plate const& page)
 {
     std::vector<DrawPlate> plates;
+    plates.reserve(kCursorCount);
     for (int index = 0; index < kCursorCount; ++index)
         plates.push_back([index](Plate const& plate) {
             DrawChecks(plate, 8, kPaper, kShade);

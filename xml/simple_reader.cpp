@@ -129,7 +129,7 @@ void xml_reader_binary_new::ReadAttributes()
 {
     while (auto const* const name = ReadNameOrEnd()) {
         std::uint32_t const textLength = ReadNumber();
-        GR_ASSERT_LINE((textLength & 1) == 0, "(textLength & 1) == 0", 201);
+        static_cast<void>(file.error || GR_ASSERT_LINE((textLength & 1) == 0, "(textLength & 1) == 0", 201));
         reader.Attribute(*name, ReadText(textLength >> 1));
     }
 }

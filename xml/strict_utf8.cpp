@@ -5,7 +5,7 @@ namespace {
 /// The characters that begin with a byte of one range. Further bytes are 80 to BF, the second maybe fewer.
 struct Lead {
     unsigned char first, last;
-    unsigned length;
+    unsigned char length;
     unsigned char secondFirst = 0x80, secondLast = 0xBF;
 };
 

@@ -1,29 +1,12 @@
 // Any bytes behind XML_HEAD, which tells the form of the file, make a tree with all its texts.
-#include <file/file.h>
-#include <xml/parser.h>
+#include <support/xml_document.h>
 
-#include <algorithm>
 #include <cstdlib>
-
-namespace {
-
-struct MemoryFile final : i_file {
-    void Read(void* buffer, std::uint64_t size, std::uint64_t& count) override
-    {
-        count = bytes.copy(static_cast<char*>(buffer), size);
-        bytes.remove_prefix(count);
-    }
-    std::string_view bytes;
-};
-
-}
 
 extern "C" int LLVMFuzzerTestOneInput(unsigned char const* data, std::size_t size)
 {
     setenv("VELLUM_SAFE_ASSERT", "none", 1);
-    std::string const all = XML_HEAD + std::string(data, data + size);
-    MemoryFile file;
-    file.bytes = all;
+    XmlFile file(XML_HEAD + std::string(data, data + size));
     xml_parser::tag* root = nullptr;
     unsigned line, column;
     xml_parser::Parse(&root, &file, line, column);

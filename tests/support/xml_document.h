@@ -1,22 +1,37 @@
 #pragma once
 
-#include <xml/tag.h>
+#include <file/file.h>
+#include <xml/parser.h>
 
 #include <algorithm>
-#include <filesystem>
 #include <random>
 
-/// A random document that knows its tree: whitespace leaves marks, which are dealt with where a text is
-/// complete.
+/// A file in memory that may come in pieces of random sizes up to `most`, and may fail at its end.
+struct XmlFile final : i_file {
+    explicit XmlFile(std::string text, unsigned mostBytes = 0, bool failing = false)
+        : bytes(std::move(text)), most(mostBytes), fails(failing)
+    {}
+    void Read(void* buffer, std::uint64_t size, std::uint64_t& count) override
+    {
+        if (most != 0) size = std::min<std::uint64_t>(size, 1 + random() % most);
+        at += count = bytes.copy(static_cast<char*>(buffer), size, at);
+        if (count == 0 && fails && !error) error = Common::Error(Common::ErrorReadFailed, {});
+    }
+    std::string const bytes;
+    unsigned const most;
+    bool const fails;
+    std::size_t at = 0;
+    std::minstd_rand random;
+};
+
+/// A random document that knows its tree: whitespace leaves marks, which are dealt with at a text's end.
 class XmlDocument {
 public:
     explicit XmlDocument(unsigned seed) : random(seed)
     {
-        Put(Choose({"", "\xEF\xBB\xBF", "<?xml?>"}));
-        Gap();
+        Put({Choose({"", "\xEF\xBB\xBF", "<?xml?>"}), Gap()});
         Element(root, 0);
-        Gap();
-        Put(Choose({"", "<!-- \n -->"}));
+        Put({Gap(), Choose({"", "<!-- \n -->"})});
     }
 
     xml_parser::tag root{"root"};
@@ -26,9 +41,9 @@ public:
 private:
     static constexpr char16_t kSpace = 0xE000, kNothing = 0xE001;
 
-    void Put(std::string token) { tokens.push_back(std::move(token)); }
+    void Put(std::vector<std::string> const& all) { tokens.insert(tokens.end(), all.begin(), all.end()); }
     std::string Choose(std::initializer_list<char const*> all) { return all.begin()[random() % all.size()]; }
-    void Gap() { Put(Choose({"", " ", "\t", "\n", " \r\n"})); }
+    std::string Gap() { return Choose({"", " ", "\t", "\n", " \r\n"}); }
 
     enum Where { InCData = 5, InValue = 18, InContent = 21 };
     void Pieces(std::u16string& text, Where where)
@@ -42,11 +57,11 @@ private:
             {"<![CDATA[", {kNothing}}};
         for (unsigned left = random() % 6, first = where == InCData ? 0 : InCData; left > 0; --left) {
             auto const& [bytes, meaning] = kPieces[first + random() % (where - first)];
-            Put(bytes);
+            Put({bytes});
             text += meaning;
             if (meaning[0] != kNothing) continue;
             Pieces(text, InCData);
-            Put("]]>");
+            Put({"]]>"});
         }
     }
 
@@ -62,20 +77,17 @@ private:
 
     void Element(xml_parser::tag& element, unsigned depth)
     {
-        Put('<' + element.Name);
+        Put({'<' + element.Name});
         for (char const* const name : {"b", ":-.9"}) {
             if (random() % 3 > 0) continue;
             std::string const quote = Choose({"'", "\""});
-            for (auto const& token :
-                {std::string(" "), std::string(name), Choose({"", "\n"}), Choose({"=", "= \t\r\n"}) + quote})
-                Put(token);
+            Put({" ", name, Gap(), Choose({"=", "= \t\r\n"}) + quote});
             Pieces(element.Attributes[name], InValue);
             Settle(element.Attributes[name], true, true);
-            Put(quote);
+            Put({quote});
         }
-        Gap();
-        if (random() % 4 == 0) return Put("/>");
-        Put(">");
+        if (random() % 4 == 0) return Put({Gap(), "/>"});
+        Put({Gap(), ">"});
         Pieces(element.Text.back(), InContent);
         for (unsigned left = random() % 4; left > 0 && depth < 5; --left) {
             Settle(element.Text.back(), element.Children.empty(), false);
@@ -83,59 +95,6 @@ private:
             Pieces(element.Text.back(), InContent);
         }
         Settle(element.Text.back(), element.Children.empty(), true);
-        Put("</" + element.Name);
-        Gap();
-        Put(">");
+        Put({"</" + element.Name, Gap(), ">"});
     }
-};
-
-/// A tree in one of the binary forms.
-class BinaryXml {
-public:
-    BinaryXml(xml_parser::tag const& root, bool newForm)
-        : bytes(newForm ? "BXML\2z" : "BXML\1z"), isNew(newForm)
-    {
-        Element(root);
-    }
-    std::string bytes;
-
-private:
-    void Number(std::size_t number)
-    {
-        for (; number > 0x7F; number >>= 7)
-            bytes += static_cast<char>(number | 0x80);
-        bytes += static_cast<char>(number);
-    }
-    void Text(std::u16string const& text)
-    {
-        std::string const utf8 = std::filesystem::path(text).string();
-        Number(utf8.size() << isNew);
-        bytes += utf8;
-    }
-    void Name(std::string const& name)
-    {
-        auto const [entry, isFirst] = ids.try_emplace(name, 100 * ids.size() + isNew);
-        Number(entry->second);
-        if (!isFirst) return;
-        Number(name.size());
-        bytes += name;
-    }
-    void Element(xml_parser::tag const& element)
-    {
-        Name(element.Name);
-        if (!isNew) Number(element.Attributes.size());
-        for (auto const& [name, value] : element.Attributes) {
-            Name(name);
-            Text(value);
-        }
-        Number(isNew ? 0 : element.Text.size());
-        for (std::size_t i = 0; i < element.Text.size(); ++i) {
-            Text(element.Text[i]);
-            if (i < element.Children.size()) Element(*element.Children[i]);
-        }
-        if (isNew) Number(0);
-    }
-
-    bool const isNew;
-    std::map<std::string, std::size_t> ids;
 };

@@ -4,7 +4,9 @@
 // Each window paints a pattern of its own, and tally marks that tell how often it was asked to paint.
 #include <tessella.h>
 
+#include <cstring>
 #include <iostream>
+#include <iterator>
 #include <memory>
 #include <vector>
 
@@ -138,6 +140,24 @@ void BuildWindows()
         pane->window->Show();
 }
 
+/// An arrow with its tip as the hot spot: '#' is ink, '.' paper, anything else is seen through.
+std::unique_ptr<GrCursor> MakeArrow()
+{
+    static constexpr char const* kRows[] = {"#", "##", "#.#", "#..#", "#...#", "#....#", "#.....#",
+        "#......#", "#.......#", "#........#", "#.....#####", "#..#..#", "#.# #..#", "##  #..#", "#    #..#",
+        "     #..#", "      ##"};
+    int const width = 11, height = static_cast<int>(std::size(kRows));
+    auto image = std::make_unique<GrImage>(width, height, GrImageHasAlpha);
+    for (int y = 0; y < height; ++y)
+        for (int x = 0, end = static_cast<int>(std::strlen(kRows[y])); x < width; ++x) {
+            char const dot = x < end ? kRows[y][x] : ' ';
+            GrColor const color = dot == '.' ? GrMakeColor(255, 255, 255) : dot == '#' ? kInk : 0;
+            std::memcpy(image->pixels + (y * width + x) * 4, &color, 4);
+            image->alphaPlane[y * width + x] = dot == ' ' ? 0 : 255;
+        }
+    return std::unique_ptr<GrCursor>(GrCursor::CreateInstance(image.release(), nullptr, 0, 0));
+}
+
 /// Brings a window, and the family that it belongs to, to the top.
 void RaiseFamily(GrWindow& window)
 {
@@ -156,6 +176,8 @@ int main(int, char** argv)
     }
     GrWindow::SetCallback(OnWindowEvent);
     BuildWindows();
+    auto const arrow = MakeArrow();
+    arrow->Activate();
 
     GrWindow* dragged = nullptr;
     int grabX = 0, grabY = 0;  // where on it the pointer holds the dragged window

@@ -1,6 +1,7 @@
 #include <tessella/font_factory.h>
 
 #include <tessella/font_cgf.h>
+#include <tessella/font_substitution.h>
 
 #include <cstdio>
 #include <map>
@@ -16,7 +17,9 @@ void RegisterFontFactory(std::uint32_t type, GrFontFactory factory) { factories[
 
 void LoadFontTable()
 {
+    ReadFontTable();
     RegisterFontFactory(GrFontTypeCgf, [](GrFontDesc const& desc) -> GrFont* { return new GrFontCGF(desc); });
+    GrEnableFreeType();
 }
 
 GrFont* GrFont::Create(
@@ -29,7 +32,8 @@ GrFont* GrFont::Create(
     request.weight = weight;
     request.flags = {italic, smooth, kerning};
 
-    GrFontDesc const& resolved = request;
+    GrFontDesc resolved = request;
+    if (HasFontTable()) ResolveFace(resolved, request);
     auto const factory = factories.find(resolved.type);
     if (factory == factories.end()) {
         std::fprintf(stderr, "TESSELLA: Warning! Unknown font type %d\r\n", static_cast<int>(resolved.type));

@@ -8,5 +8,5 @@ using GrFontFactory = GrFont* (*)(GrFontDesc const& desc);
 /// Has fonts of a type made by `factory` from now on. The application's thread.
 void RegisterFontFactory(std::uint32_t type, GrFontFactory factory);
 
-/// What the start of a session does for fonts: registers the factories.
+/// What the start of a session does for fonts: reads the table of substitutions and registers the factories.
 void LoadFontTable();

@@ -139,32 +139,38 @@ public:
     /// surface clips.
     virtual void DrawImageMasked(
         GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) = 0;
-    /// Copies an image to the rectangle `dst`; its pixel `sx`, `sy` goes to the top left corner. An image
-    /// with an alpha plane is blended as its flags say. Other images are copied, fast if `bits` and `bytes`
-    /// are those of the context's format. All others are converted as `CopyFromContext` does, and pixels that
-    /// are not in the image become black then; without errors being diffused.
+    /// Copies an image to the rectangle `dst`; its pixel `sx`, `sy` goes to the top left corner.
+    ///
+    /// An image with an alpha plane is blended as its flags say, see `DrawImageAlpha`. Others are copied as
+    /// they are if their `bits` and `bytes` are those of the context's format, which is fast. All others are
+    /// converted as `CopyFromContext` does, without diffusing errors; pixels that are not in the image become
+    /// black then. Nothing is drawn if the image's format has no context.
     virtual void DrawImage(GrRect const& dst, GrImage const& image, int sx, int sy) = 0;
     /// Blends a true-colour image into the rectangle `dst`, or the fore colour if `image` is null; its pixel
     /// `sx`, `sy` goes to the top left corner. An image without pixels, but with an alpha plane, gives the
-    /// fore colour its shape. A pixel of an image is expected to be multiplied by its own alpha already, and
-    /// not by a uniform one. With `overDestination` alpha 0 leaves a pixel alone; otherwise it takes the back
-    /// colour. Products are shifted, not rounded, so that blends come out a little dark; sums are not
-    /// limited, but run over into the next channel. An image that is not of true colour is reported by a
-    /// failed assertion and not drawn; nor is anything if there should be an alpha plane, but is none.
+    /// fore colour its shape. Pixels are expected to be multiplied by the alpha of the image's own plane
+    /// already; a uniform alpha is multiplied in here.
+    ///
+    /// With `overDestination`, alpha 0 leaves a pixel alone; otherwise it takes the back colour. Products are
+    /// shifted, not rounded, so that blends come out a little dark, and a sum above 255 runs over into the
+    /// next channel.
+    ///
+    /// An image that is not of true colour is reported by a failed assertion and not drawn. Nor is anything
+    /// drawn if `uniformAlpha` is not set and there is no alpha plane.
     virtual void DrawImageAlpha(
         GrRect const& dst, GrImage const* image, int sx, int sy, GrBlendParams const& params) = 0;
-    /// Copies the rectangle `src` of the surface to an image, from its pixel `dx`, `dy` on. What lies outside
-    /// the clip is not written if `bits` and `bytes` of the image are those of the context's format, and
-    /// black otherwise, the image's own bounds holding then.
+    /// Copies the rectangle `src` of the surface to an image, from its pixel `dx`, `dy` on. If `bits` and
+    /// `bytes` of the image are those of the context's format, pixels outside the clip are not written, and
+    /// the others must lie in the image. Otherwise the pixels are converted, those outside the clip become
+    /// black, and the image's bounds hold.
     virtual void ReadImage(GrRect const& src, GrImage& image, int dx, int dy) = 0;
 
-    /// `DrawImageMasked` without clip, origin and lock: `dst` is in surface coordinates and must lie on the
-    /// surface. Callers that draw on the screen see to it themselves that nobody else does. An empty
-    /// rectangle is left alone.
+    /// `DrawImageMasked` without clip, origin and lock, for callers that have clipped already: `dst` is in
+    /// surface coordinates and must lie on the surface, and on the screen nobody else may draw meanwhile.
     virtual void DrawImageMaskedDirect(
         GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) = 0;
-    /// `DrawImage` in the same way, for images in the context's own format only. An alpha plane is not looked
-    /// at.
+    /// `DrawImage` in the same way, for images in the context's own format only: nothing tests or converts
+    /// it, and an alpha plane is not looked at.
     virtual void DrawImageDirect(GrRect const& dst, GrImage const& image, int sx, int sy) = 0;
     /// `DrawImageAlpha` in the same way, for true-colour images only; `image` is not null.
     virtual void DrawImageAlphaDirect(
@@ -173,10 +179,10 @@ public:
     virtual void ReadImageDirect(GrRect const& src, GrImage& image, int dx, int dy) = 0;
 
     /// Fills the rectangle `dst` from another context, whose point `sx`, `sy`, in its own context
-    /// coordinates, goes to the top left corner, converting each pixel. Where the source's `GetPixel` is 0,
-    /// outside its clip, too, the pixel becomes black. Within one surface, pixels are copied in the order in
-    /// which they are painted, and one that has been painted is copied as it is then. Contexts that cannot
-    /// copy do nothing.
+    /// coordinates, goes to the top left corner, converting each colour. Where the source's `GetPixel` yields
+    /// 0, as outside its clip, the pixel becomes black. Within one surface, pixels are copied from the top
+    /// left on, also those that have been painted just before: overlaps are not taken care of. Contexts that
+    /// cannot copy do nothing.
     virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);
 };
 
@@ -188,8 +194,8 @@ public:
     virtual void LoadPixels(std::uint8_t const* data, unsigned step) = 0;
     /// Fills the image from a stream of pixels as `LoadPixels` does, diffusing the errors of the conversion
     /// whatever the flags say. `alpha` is null or holds one value for each pixel of the image: pixels with a
-    /// value below 255 are left alone. The fourth byte of a pixel of the stream is not looked at. Does
-    /// nothing in formats of 24 and 32 bits.
+    /// value below 255 are left alone. Fourth bytes of the stream are not looked at. Does nothing in formats
+    /// of 24 and 32 bits.
     virtual void LoadPixelsDithered(std::uint8_t const* data, std::uint8_t const* alpha, unsigned step) = 0;
     /// Writes the whole image as a stream of pixels: what `GrImage::Unload` does. `data` and `step` are as
     /// there.

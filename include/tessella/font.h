@@ -90,3 +90,7 @@ protected:
     /// A font that is not valid yet.
     GrFontBase(bool wantsSmooth, std::uint32_t wantedWeight) : smooth(wantsSmooth), weight(wantedWeight) {}
 };
+
+/// Has the fonts that the table of substitutions wants drawn by FreeType made from now on. `GrInit` does this
+/// itself; the application's thread.
+GR_API void GrEnableFreeType();

@@ -53,9 +53,9 @@ public:
     GrContext* GetContext() const;
 
     /// Fills the image from a stream of `width` times `height` pixels, row after row from the top. A pixel
-    /// begins with its red, green and blue bytes; `step` is the distance from one to the next, usually 3 or
-    /// 4. The image counts as premultiplied from here on, and contexts made later are of that kind: colours
-    /// of a true-colour image are multiplied by their alpha, and become 0 if there is no alpha plane.
+    /// begins with its red, green and blue bytes; `step` is the distance from one to the next, usually 3
+    /// or 4. The image counts as premultiplied from here on, for contexts made later, too: the colours of a
+    /// true-colour image are multiplied by their alpha, and become 0 if there is no alpha plane.
     ///
     /// An image with an alpha plane takes it from the fourth byte of each pixel, of which there must be one.
     /// But formats of at most 16 bits diffuse their errors, unless `GrImageNoDither` is set, and then expect

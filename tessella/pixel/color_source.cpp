@@ -18,8 +18,8 @@ bool GrColorSource::IsOf()
     // The library has one description of each class, so that its address is enough.
     if (&typeid(source) != &typeid(Context)) return false;
     extent = static_cast<Context&>(source).ExtentOfClip();
-    read = [](GrContext& context, int x, int y, int count, GrColor* colors) {
-        static_cast<Context&>(context).ReadClipped(x, y, count, colors);
+    read = [](GrContext& context, int x, int y, int count, GrColor* room) {
+        return static_cast<Context&>(context).ReadClipped(x, y, count, room);
     };
     return true;
 }

@@ -1,19 +1,12 @@
 #pragma once
 
 #include <tessella/color.h>
+#include <tessella/pixel/pixel_extent.h>
 
 class GrContext;
 
-/// The addresses of some pixels, from the first to behind the last.
-struct GrPixelExtent {
-    unsigned char const* begin;
-    unsigned char const* end;
-
-    bool Meets(GrPixelExtent const& other) const { return begin < other.end && other.begin < end; }
-};
-
-/// A context to copy colours from. Those of the library's own classes give many at a time, the same that their
-/// `GetPixel` would.
+/// A context to copy colours from. Those of the library's own classes give many at a time, the same that
+/// their `GetPixel` would.
 class GrColorSource {
 public:
     explicit GrColorSource(GrContext& copied);
@@ -22,8 +15,12 @@ public:
     /// of other classes nothing is known, and they are asked pixel by pixel.
     bool MayReadAhead(GrPixelExtent const& written) const { return read && !extent.Meets(written); }
 
-    /// `count` colours from context point `x`, `y` on; 0 outside the clip.
-    void Read(int x, int y, int count, GrColor* colors) const { read(source, x, y, count, colors); }
+    /// `count` colours from context point `x`, `y` on; 0 outside the clip. They are put into `room`, unless
+    /// they lie somewhere as they are.
+    GrColor const* Read(int x, int y, int count, GrColor* room) const
+    {
+        return read(source, x, y, count, room);
+    }
 
 private:
     template <typename Context>
@@ -31,5 +28,5 @@ private:
 
     GrContext& source;
     GrPixelExtent extent{};
-    void (*read)(GrContext& source, int x, int y, int count, GrColor* colors) = nullptr;
+    GrColor const* (*read)(GrContext& source, int x, int y, int count, GrColor* room) = nullptr;
 };

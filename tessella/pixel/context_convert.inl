@@ -1,6 +1,7 @@
 #include <algorithm>
 #include <iterator>
 #include <memory>
+#include <type_traits>
 
 template <typename S, GrColorsPolicy Colors>
 void GrGenericContext<S, Colors>::DrawImage(GrRect const& dst, GrImage const& image, int sx, int sy)
@@ -45,19 +46,25 @@ GrPixelExtent GrGenericContext<S, Colors>::ExtentOfClip() const
 }
 
 template <typename S, GrColorsPolicy Colors>
-void GrGenericContext<S, Colors>::ReadClipped(int x, int y, int count, GrColor* colors) const
+GrColor const* GrGenericContext<S, Colors>::ReadClipped(int x, int y, int count, GrColor* room) const
 {
-    std::fill_n(colors, count, GrColor{0});
     int const left = Moved(x, this->originX), right = Moved(left, count), row = Moved(y, this->originY);
-    GrRegion::Band const* const band = this->clip.FindBand(row);
-    if (!band || !this->HasPixels()) return;
+    GrRegion::Band const* const band = this->HasPixels() ? this->clip.FindBand(row) : nullptr;
+    bool const isWhole =
+        band && band->item_count == 1 && band->items[0].r1 <= left && right <= band->items[0].r2;
+    if (!isWhole) std::fill_n(room, count, GrColor{0});
+    if (!band) return room;
     for (auto const& range : RangesOf(*band)) {
         int const from = std::max(range.r1, left), to = std::min(range.r2, right);
         if (from >= to) continue;
         typename S::Guard const guard(GrRect{from, row, to, row + 1});
-        ReadColors<typename S::Width, Colors>(
-            this->PixelAddress(this->RowAddress(row), from), to - from, colors + (from - left));
+        unsigned char const* const first = this->PixelAddress(this->RowAddress(row), from);
+        if constexpr (std::is_same_v<Colors, GrColorsRGB>)
+            if (isWhole && reinterpret_cast<std::uintptr_t>(first) % alignof(GrColor) == 0)
+                return reinterpret_cast<GrColor const*>(first);
+        ReadColors<typename S::Width, Colors>(first, to - from, room + (from - left));
     }
+    return room;
 }
 
 template <typename S, GrColorsPolicy Colors>
@@ -76,10 +83,11 @@ void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* 
                             row, xRange.r1 + x, Colors::ToPixel(source->GetPixel(Moved(sourceX, x), rowY)));
                     continue;
                 }
-                GrColor colors[256];
+                GrColor room[1024];
                 for (int x = xRange.r1, count; x < xRange.r2; x += count) {
-                    count = std::min(xRange.r2 - x, static_cast<int>(std::size(colors)));
-                    colorSource.Read(Moved(sourceX, x - xRange.r1), rowY, count, colors);
+                    count = std::min(xRange.r2 - x, static_cast<int>(std::size(room)));
+                    GrColor const* const colors =
+                        colorSource.Read(Moved(sourceX, x - xRange.r1), rowY, count, room);
                     WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), count, colors);
                 }
             }

@@ -29,8 +29,8 @@ using FourRows = std::uint8_t __attribute__((vector_size(16)));
 using FourWords = std::uint32_t __attribute__((vector_size(16)));
 
 /// For 15 and 16 bits. Their pixels are never brighter than the colour that was wanted, so that no error is
-/// negative and all fit into bytes. They are kept twice as large as they are handed on: as the bits `kLost` that
-/// a pixel leaves over, but for the lowest of each channel.
+/// negative and all fit into bytes. They are kept twice as large as they are handed on: as the bits `kLost`
+/// that a pixel leaves over, but for the lowest of each channel.
 template <std::uint32_t kLost>
 struct WavePart16 {
     using Vector = FourRows;

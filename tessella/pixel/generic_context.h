@@ -121,9 +121,9 @@ public:
     void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy) override;
 
     /// For others to copy from: where the pixels lie that the clip lets through, and what `GetPixel` yields
-    /// for `count` pixels from `x`, `y` on.
+    /// for `count` pixels from `x`, `y` on. It is either put into `room`, or lies where the pixels do.
     GrPixelExtent ExtentOfClip() const;
-    void ReadClipped(int x, int y, int count, GrColor* colors) const;
+    GrColor const* ReadClipped(int x, int y, int count, GrColor* room) const;
 
 private:
     static constexpr char kSource[] = GR_SOURCE("tessella/context");

@@ -13,9 +13,9 @@
 #define GR_WIDE_MASKS
 #endif
 
-// Several pixels at a time, in vectors of one word a pixel, as wide as the processor's registers. Sources that
-// include this are compiled for one generation of processors each; everything here is inlined, so that nothing
-// is shared between them.
+// Several pixels at a time, in vectors of one word a pixel, as wide as the processor's registers. Sources
+// that include this are compiled for one generation of processors each; everything here is inlined, or
+// depends on the number of lanes, so that they share no code.
 
 #define GR_INLINE [[gnu::always_inline]] inline
 #define GR_INLINE_LAMBDA __attribute__((always_inline))
@@ -55,8 +55,8 @@ struct GrWide : GrWideVectors<kLaneCount> {
     using typename GrWideVectors<kLaneCount>::Anywhere;
     using typename GrWideVectors<kLaneCount>::Halves;
 
-    /// Colours taken apart, so that there is room for products: red in bits 0 to 7 and blue in 16 to 23 of one
-    /// word, green in bits 0 to 7 of the other.
+    /// Colours taken apart, so that there is room for products: red in bits 0 to 7 and blue in 16 to 23 of
+    /// one word, green in bits 0 to 7 of the other.
     struct Channels {
         Words redBlue, green;
     };
@@ -197,8 +197,8 @@ struct GrWide : GrWideVectors<kLaneCount> {
         return *static_cast<Anywhere const*>(address);
     }
 
-    /// Where the lanes begin that contain column `next`, out of `from` to `to`. The last ones go back over some
-    /// columns that are done already, unless there are fewer columns than lanes in all.
+    /// Where the lanes begin that contain column `next`, out of `from` to `to`. The last ones go back over
+    /// some columns that are done already, unless there are fewer columns than lanes in all.
     static constexpr int Start(int next, int from, int to)
     {
         return to - next < kLanes && to - from >= kLanes ? to - kLanes : next;

@@ -70,7 +70,7 @@ GR_INLINE void DiffuseWide(GrBlend const& blend)
     int const width = blend.target.width, height = blend.target.height;
     unsigned char few[(kFewColumns + 3 * kWaveRows) * TheWave::kCellBytes];
     unsigned char* const cells = width < kFewColumns ? few : reinterpret_cast<unsigned char*>(blend.errors);
-    std::memset(cells, 0, static_cast<std::size_t>((width + 3 * kWaveRows) * TheWave::kCellBytes));
+    std::memset(cells, 0, TheWave::kCellBytes * (static_cast<std::size_t>(width) + 3 * kWaveRows));
 
     WideSource<Format, kHasColors, kHasAlphas> source(blend);
     for (int top = 0; top < height; top += kWaveRows) {

@@ -5,7 +5,8 @@
 
 #include <type_traits>
 
-/// The loops over rows of one format, for processors with registers for `kLanes` words: 16, 8 or 4. Any thread.
+/// The loops over rows of one format, for processors with registers for `kLanes` words: 16, 8 or 4. Any
+/// thread.
 template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
 struct GrWideRows {
     /// As `BlendPixels`. Error rows are room for its own purposes.
@@ -30,12 +31,10 @@ constexpr bool kHasWideRows = !std::is_same_v<Colors, GrColors4> && !std::is_sam
 /// The most lanes that the processor has registers for, and for which there are rows.
 inline int WideLanes()
 {
-#ifdef __x86_64__
     if (__builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
         __builtin_cpu_supports("avx512dq") && __builtin_cpu_supports("avx512vl"))
         return 16;
     if (__builtin_cpu_supports("avx2")) return 8;
-#endif
     return 4;
 }
 

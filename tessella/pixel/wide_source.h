@@ -3,8 +3,8 @@
 #include <tessella/pixel/blend.h>
 #include <tessella/pixel/wide_format.h>
 
-/// What the alpha values of some pixels have in common. Icons consist of runs of 0 and 255, with little between
-/// them.
+/// What the alpha values of some pixels have in common. Icons consist of runs of 0 and 255, with little
+/// between them.
 enum class AlphaRun { Clear, Opaque, Mixed };
 
 GR_INLINE AlphaRun RunOf(std::uint8_t alpha)
@@ -12,8 +12,8 @@ GR_INLINE AlphaRun RunOf(std::uint8_t alpha)
     return alpha == 0 ? AlphaRun::Clear : alpha == 255 ? AlphaRun::Opaque : AlphaRun::Mixed;
 }
 
-/// The source of a blend in one format, as many pixels at a time as there are lanes. It has colours of its own
-/// or else the fore colour, and alpha values or else a uniform one.
+/// The source of a blend in one format, as many pixels at a time as there are lanes. It has colours of its
+/// own or else the fore colour, and alpha values or else a uniform one.
 template <typename Format, bool kHasColors, bool kHasAlphas>
 struct WideSource {
     using W = typename Format::Wide;
@@ -36,7 +36,7 @@ struct WideSource {
                 W::CopyFirst(few, alphas, count);
                 alphas = few;
             }
-            using Some = std::conditional_t < W::kLanes<8, std::uint32_t, std::uint64_t>;
+            using Some = std::conditional_t<sizeof few == 4, std::uint32_t, std::uint64_t>;
             Some any = 0, all = static_cast<Some>(~Some{0});
             for (std::size_t i = 0; i < W::kLanes; i += sizeof(Some)) {
                 Some some;

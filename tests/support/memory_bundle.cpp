@@ -46,7 +46,7 @@ FileHandle* OpenFile(ModuleHandle* module, char const* name, char const* /*varia
 
 unsigned char* LoadFile(ModuleHandle* module, char const* /*name*/, char const* /*variant*/, unsigned* size)
 {
-    return module != nullptr ? NewCopy("data", size) : nullptr;
+    return module != nullptr ? NewCopy(memoryBundle.loaded, size) : nullptr;
 }
 
 bool ReadFile(FileHandle* file, void* buffer, unsigned size, unsigned* read)
@@ -78,6 +78,18 @@ void CloseFile(FileHandle* file)
 {
     delete file;
     --memoryBundle.openFiles;
+}
+
+void SubscribeLanguageEvents(void (*callback)())
+{
+    memoryBundle.callback = callback;
+    ++memoryBundle.subscriptions;
+    if (memoryBundle.callsBack) callback();
+}
+
+void UnsubscribeLanguageEvents(void (*callback)())
+{
+    if (callback == memoryBundle.callback) std::puts("unsubscribed");
 }
 
 }

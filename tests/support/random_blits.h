@@ -24,8 +24,8 @@ inline ImageKind const kImageKinds[] = {{Canvas::FormatOf<GrSurface8, GrColors4>
     {Canvas::FormatOf<GrSurface32, GrColorsRGBA>(), GrImageTrueColor | GrImagePremultiplied}};
 
 /// Random blits of all kinds, from images of every format, on a context and on the canvas that judges it. The
-/// judge goes from range to range as a context does, since that shows where a surface is copied onto itself, and
-/// where errors are diffused.
+/// judge goes from range to range as a context does, since that shows where a surface is copied onto itself,
+/// and where errors are diffused.
 class RandomBlits {
 public:
     /// `drawnImage` is what the context draws on, or null for a screen.
@@ -166,8 +166,8 @@ private:
         EXPECT_EQ(std::memcmp(read->pixels, expected->pixels, size), 0);
     }
 
-    /// From a context with a clip and an origin of its own, or from an image as a whole; not only where it has
-    /// pixels.
+    /// From a context with a clip and an origin of its own, or from an image as a whole; not only where it
+    /// has pixels.
     void CopyForeign()
     {
         ImageKind const& kind = kImageKinds[Number(0, 7)];

@@ -12,8 +12,8 @@
 
 namespace {
 
-/// Compares the rows for one width of registers with those that go pixel by pixel: first on all pairs of alpha and
-/// channel and, in 16 bits, all pixels, then on random ones of all sizes.
+/// Compares the rows for one width of registers with those that go pixel by pixel: first on all pairs of
+/// alpha and channel and, in 16 bits, all pixels, then on random ones of all sizes.
 template <int kLanes, typename Surface, typename Colors>
 void JudgeRows()
 {
@@ -178,6 +178,20 @@ TEST(Blend, FillsHolesAndRefusesWhatCannotBeBlended)
         std::string::npos);
     for (auto const* const image : {&picture.image, static_cast<GrImage*>(nullptr)})
         EXPECT_EQ(picture.Blended(1, 2, {true, false, false, 128}, image), 2u) << "there is no alpha plane";
+}
+
+TEST(Blend, OfAnImageIntoItselfGoesFromLeftToRight)
+{
+    GrImage image(40, 1, GrImageTrueColor);
+    std::unique_ptr<GrContext> const context(image.GetContext());
+    GrColor colors[40];
+    for (unsigned i = 0; i < 40; ++i)
+        colors[i] = i * 0x050607;
+    std::memcpy(image.pixels, colors, sizeof colors);
+    context->DrawImageAlpha({1, 0, 40, 1}, &image, 0, 0, {true, false, true, 200});
+    for (unsigned i = 1; i < 40; ++i)
+        colors[i] = Mixed(Faded(colors[i - 1], 200), colors[i], 55);
+    EXPECT_EQ(std::memcmp(image.pixels, colors, sizeof colors), 0);
 }
 
 TEST(Blit, TakesAnyCoordinatesAndNoUnknownFormat)

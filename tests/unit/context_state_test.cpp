@@ -254,6 +254,18 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
              Case{[&] { context->FillArc(50, 50, 20, 20, 100, 200); }, false},
              Case{[&] { context->FillArc(0, -8, 20, 20, 5760, 2000); }, true},
              Case{[&] { context->DrawPixel(1, 1); }, true}, Case{[&] { context->GetPixel(1, 1); }, true},
+             Case{[&] {
+                      context->FillRegionAlpha(GrRect{1, 1, 2, 2}, 9);
+                  },
+                 true},
+             Case{[&] {
+                      context->CopyFromContext({0, 0, 1, 1}, context.get(), 0, 0);
+                  },
+                 true},
+             Case{[&] {
+                      context->DrawImageAlphaDirect({0, 0, 1, 1}, nullptr, 0, 0, {});
+                  },
+                 false},
              Case{[&] { context->DrawPixel(16, 1); }, false},
              Case{[&] { context->GetPixel(1, -1); }, false}}) {
         screenMutex.lock();

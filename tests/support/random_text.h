@@ -128,11 +128,13 @@ private:
             for (int u = 0; u < width; ++u) {
                 int const x = left + u, y = top + v, streamed = v * width + u;
                 if (!canvas.InClip(x, y)) continue;
+                if (glyph.bitsPerPixel != 1) {
+                    Blend(x, y, glyph.bits[streamed], transparent);
+                    continue;
+                }
                 bool const set = pitch == 0 ? glyph.bits[streamed / 8] >> streamed % 8 & 1
                                             : glyph.bits[v * pitch + u / 8] >> (7 - u % 8) & 1;
-                if (glyph.bitsPerPixel != 1)
-                    Blend(x, y, glyph.bits[streamed], transparent);
-                else if (!transparent)
+                if (!transparent)
                     canvas.Write(x, y, set ? canvas.fore : canvas.back);
                 else if (set)
                     canvas.Paint(x, y);

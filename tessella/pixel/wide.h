@@ -75,8 +75,8 @@ struct GrWide : GrWideVectors<kLaneCount> {
     /// The word's halves exchanged.
     GR_INLINE static Words Turned(Words const& words) { return words << 16 | words >> 16; }
 
-    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is all
-    /// that is needed.
+    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is
+    /// all that is needed.
     GR_INLINE static Halves Factors(Words const& factors)
     {
         Words const upper = factors << 8;
@@ -199,7 +199,7 @@ struct GrWide : GrWideVectors<kLaneCount> {
 
     /// Where the lanes begin that contain column `next`, out of `from` to `to`. The last ones go back over
     /// some columns that are done already, unless there are fewer columns than lanes in all.
-    static constexpr int Start(int next, int from, int to)
+    GR_INLINE static constexpr int Start(int next, int from, int to)
     {
         return to - next < kLanes && to - from >= kLanes ? to - kLanes : next;
     }

@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <limits>
 
 namespace {
 
@@ -180,7 +181,11 @@ bool GrWedgeWalker::NextLine(GrRect& line)
 Coverage CoverageOf(GrRect const& rect, GrRegion const& region)
 {
     std::int64_t inside = 0;
+    bool apart = true;  // else pixels are counted twice, and the region may not find them
+    int bottom = std::numeric_limits<int>::min();
     for (auto const& band : BandsOf(region)) {
+        apart = apart && band.r1 >= bottom;
+        bottom = band.r2;
         std::int64_t const rows = std::int64_t{std::min(band.r2, rect.y2)} - std::max(band.r1, rect.y1);
         if (rows <= 0) continue;
         for (auto const& range : RangesOf(band)) {
@@ -190,6 +195,6 @@ Coverage CoverageOf(GrRect const& rect, GrRegion const& region)
         }
     }
     if (inside == 0) return Coverage::None;
-    bool const all = inside == (std::int64_t{rect.x2} - rect.x1) * (std::int64_t{rect.y2} - rect.y1);
+    bool const all = apart && inside == (std::int64_t{rect.x2} - rect.x1) * (std::int64_t{rect.y2} - rect.y1);
     return all ? Coverage::All : Coverage::Part;
 }

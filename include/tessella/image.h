@@ -48,8 +48,9 @@ public:
     void Detach();
 
     /// A new context over the image, in its format, with the image's size as its limit. The caller deletes
-    /// it, before the image. Null for `bits` that no format has, after a failed assertion. An image in the
-    /// screen's format does not survive a change of mode: its pixels may then be taken for wider ones.
+    /// it, before the image. Null for `bits` that no format has, after a failed assertion. `bytes` tell the
+    /// two formats of 24 bits apart, and count for no other one. An image made in the screen's format keeps
+    /// its own when the mode changes.
     GrContext* GetContext() const;
 
     /// Fills the image from a stream of `width` times `height` pixels, row after row from the top. A pixel

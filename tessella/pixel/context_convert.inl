@@ -69,6 +69,7 @@ GrColor const* GrGenericContext<S, Colors>::ReadClipped(int x, int y, int count,
 template <typename S, GrColorsPolicy Colors>
 void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy)
 {
+    if (!source) return;
     GrColorSource const colorSource(*source);
     bool const readAhead = colorSource.MayReadAhead(ExtentOfClip());
     this->WalkClip(

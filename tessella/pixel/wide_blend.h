@@ -2,6 +2,8 @@
 
 #include <tessella/pixel/wide_source.h>
 
+namespace wide {
+
 inline constexpr std::uint32_t kLaneNumbers[] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
 
 template <typename Format, bool kHasColors, bool kHasAlphas>
@@ -54,4 +56,6 @@ GR_INLINE void BlendFormat(GrBlend const& blend)
         blend.alphas ? BlendWide<Format, true, true>(blend) : BlendWide<Format, true, false>(blend);
     else
         blend.alphas ? BlendWide<Format, false, true>(blend) : BlendWide<Format, false, false>(blend);
+}
+
 }

@@ -75,8 +75,8 @@ struct GrWide : GrWideVectors<kLaneCount> {
     /// The word's halves exchanged.
     GR_INLINE static Words Turned(Words const& words) { return words << 16 | words >> 16; }
 
-    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is all
-    /// that is needed.
+    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is
+    /// all that is needed.
     GR_INLINE static Halves Factors(Words const& factors)
     {
         Words const upper = factors << 8;

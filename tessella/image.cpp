@@ -95,16 +95,19 @@ GrContext* GrImage::GetContext() const
         return flags & GrImagePremultiplied ? CreateImageContext<GrSurface32, GrColorsRGBA>(image)
                                             : CreateImageContext<GrSurface32, GrColorsRGB>(image);
 
-    // The screen's own format comes first: 24 bits in four bytes cannot be told from three bytes by `bits`.
-    if (GrScreen.createImageContext && static_cast<std::uint32_t>(bits) == GrScreen.depth)
-        return GrScreen.createImageContext(image);
+    // An image that was made in another mode may have the depth of this one and pixels of another width.
+    bool const isScreens = static_cast<std::uint32_t>(bits) == GrScreen.depth &&
+        static_cast<std::uint32_t>(bytes) == GrScreen.bytesPerPixel;
+    if (GrScreen.createImageContext && isScreens) return GrScreen.createImageContext(image);
 
     switch (bits) {
     case 4: return CreateImageContext<GrSurface8, GrColors4>(image);
     case 8: return CreateImageContext<GrSurface8, GrColors8>(image);
     case 15: return CreateImageContext<GrSurface16, GrColors15>(image);
     case 16: return CreateImageContext<GrSurface16, GrColors16>(image);
-    case 24: return CreateImageContext<GrSurface24, GrColors24>(image);
+    case 24:
+        return bytes == 4 ? CreateImageContext<GrSurface32, GrColors24>(image)
+                          : CreateImageContext<GrSurface24, GrColors24>(image);
     case 32: return CreateImageContext<GrSurface32, GrColors24>(image);
     default: GR_ASSERT_TEXT(false, "false"); return nullptr;
     }

@@ -40,16 +40,17 @@ class Output {
 public:
     explicit Output(GrItemArray<Band>& bands) : list(bands) { list.item_count = 0; }
 
-    /// Appends the rows `r1` to `r2` with what `band` and `other` share; rows that show the same as those
-    /// above them only make that band longer.
+    /// Appends the rows `r1` to `r2`, if there are any, with what `band` and `other` share; rows that show
+    /// the same as those above them only make that band longer.
     void Append(int r1, int r2, Band const& band, Band const& other)
     {
+        if (r1 >= r2) return;
         Reserve(list, list.item_count + 1);
         Band& added = list.items[list.item_count];
         added.r1 = r1;
         added.r2 = r2;
         IntersectRanges(added, band, other);
-        if (list.item_count > 0 && added == (&added)[-1])
+        if (list.item_count > 0 && (&added)[-1].r1 < r2 && added == (&added)[-1])
             (&added)[-1].r2 = r2;
         else
             ++list.item_count;
@@ -59,7 +60,8 @@ private:
     GrItemArray<Band>& list;
 };
 
-/// The steps of `region &= other`, with `top` the upper end of what is left of the band at `from`.
+/// The steps of `region &= other`, with `top` the upper end of what is left of the band at `from`. Bands that
+/// overlap others may begin, or even end, above the first one of `other`: only what lies below that counts.
 void Cut(GrRegion& result, GrItemArray<Band> const& region, GrItemArray<Band> const& other)
 {
     Output output(result.bands);
@@ -67,17 +69,18 @@ void Cut(GrRegion& result, GrItemArray<Band> const& region, GrItemArray<Band> co
     Band const* const srcEnd = src + other.item_count;
     Band const* from = region.items + FirstEndingAfter(region, src->r1);
     Band const* const end = region.items + region.item_count;
-    int top = from != end ? std::max(from->r1, src->r1) : 0;
+    int const first = src->r1;
+    int top = from != end ? std::max(from->r1, first) : 0;
     while (src != srcEnd && from != end) {
         if (src->r2 <= top) {
             ++src;
         } else if (top < src->r1) {
-            output.Append(top, src->r1, *from, *src);
+            output.Append(top, std::min(src->r1, from->r2), *from, *src);
             top = src->r1;
         } else if (src->r2 >= from->r2) {
             output.Append(top, from->r2, *from, *src);
             if (src->r2 == from->r2) ++src;
-            if (++from != end) top = from->r1;
+            if (++from != end) top = std::max(from->r1, first);
         } else {
             output.Append(top, src->r2, *from, *src);
             top = src->r2;

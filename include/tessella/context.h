@@ -141,10 +141,11 @@ public:
         GrRect const& dst, GrImage const& image, GrBitmap const& mask, int sx, int sy) = 0;
     /// Copies an image to the rectangle `dst`; its pixel `sx`, `sy` goes to the top left corner.
     ///
-    /// An image with an alpha plane is blended as its flags say, see `DrawImageAlpha`. Others are copied as
-    /// they are if their `bits` and `bytes` are those of the context's format, which is fast. All others are
-    /// converted as `CopyFromContext` does, without diffusing errors; pixels that are not in the image become
-    /// black then. Nothing is drawn if the image's format has no context.
+    /// An image with an alpha plane is blended as its flags say, see `DrawImageAlpha`: if it is not of true
+    /// colour, that is reported by a failed assertion and nothing is drawn. Others are copied as they are if
+    /// their `bits` and `bytes` are those of the context's format, which is fast. All others are converted as
+    /// `CopyFromContext` does, without diffusing errors; pixels that are not in the image become black then.
+    /// Nothing is drawn if the image's format has no context.
     virtual void DrawImage(GrRect const& dst, GrImage const& image, int sx, int sy) = 0;
     /// Blends a true-colour image into the rectangle `dst`, or the fore colour if `image` is null; its pixel
     /// `sx`, `sy` goes to the top left corner. An image without pixels, but with an alpha plane, gives the
@@ -182,7 +183,7 @@ public:
     /// coordinates, goes to the top left corner, converting each colour. Where the source's `GetPixel` yields
     /// 0, as outside its clip, the pixel becomes black. Within one surface, pixels are copied from the top
     /// left on, also those that have been painted just before: overlaps are not taken care of. Contexts that
-    /// cannot copy do nothing.
+    /// cannot copy do nothing, and neither does any with a null `source`.
     virtual void CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy);
 };
 

@@ -48,25 +48,29 @@ public:
     void Detach();
 
     /// A new context over the image, in its format, with the image's size as its limit. The caller deletes
-    /// it, before the image. Null for `bits` that no format has, after a failed assertion. An image in the
-    /// screen's format does not survive a change of mode: its pixels may then be taken for wider ones.
+    /// it, before the image. Null for `bits` that no format has, after a failed assertion. `bytes` tell the
+    /// two formats of 24 bits apart, and count for no other one. An image made in the screen's format keeps
+    /// its own when the mode changes.
     GrContext* GetContext() const;
 
     /// Fills the image from a stream of `width` times `height` pixels, row after row from the top. A pixel
     /// begins with its red, green and blue bytes; `step` is the distance from one to the next, usually 3
-    /// or 4. The image counts as premultiplied from here on, for contexts made later, too: the colours of a
+    /// or 4; the bytes that a larger one passes over are not looked at, and with a smaller one pixels share
+    /// bytes. The image counts as premultiplied from here on, for contexts made later, too: the colours of a
     /// true-colour image are multiplied by their alpha, and become 0 if there is no alpha plane.
     ///
     /// An image with an alpha plane takes it from the fourth byte of each pixel, of which there must be one.
     /// But formats of at most 16 bits diffuse their errors, unless `GrImageNoDither` is set, and then expect
     /// the alpha plane to be filled already: pixels with a value below 255 are left alone, and fourth bytes
-    /// are not looked at. Nothing happens if the image's format has no context.
+    /// are not looked at. Nothing happens if the image's format has no context, or its size no pixels.
     void Load(unsigned char const* data, unsigned step);
 
     /// Writes the image as a stream like that of `Load`, without the alpha plane. All pixels but the last
     /// write 8 bytes from their place on, red, green, blue, the colour's alpha and zeros, which the next ones
     /// overwrite in part; the last writes 3. With a `step` of 3, the buffer needs room for 2 bytes behind the
-    /// stream; with a `step` of 4, for none. An image without pixels writes nothing.
+    /// stream, with one below 3 for 8 - 2 * `step`, and with a `step` of 4 or more for none. Below 3, only
+    /// the first `step` bytes of a pixel remain; above 8, the bytes between are not touched. An image without
+    /// pixels writes nothing.
     void Unload(unsigned char* data, unsigned step);
 
     /// Changes `GrImageNoDither` and `GrImageOverBack` to what `newFlags` say, and nothing else. Contexts

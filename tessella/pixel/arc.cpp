@@ -1,10 +1,18 @@
 #include <tessella/pixel/arc.h>
 
 #include <tessella/coordinates.h>
-#include <tessella/pixel/clip_walk.h>
 
 #include <algorithm>
 #include <cmath>
+#include <cstddef>
+#include <limits>
+
+// The order of the fields is settled.
+static_assert(offsetof(GrArcState, lowerRow) == 12 && offsetof(GrArcState, lowerAddress) == 24 &&
+    offsetof(GrArcState, region) == 32 && offsetof(GrArcState, wedges) == 48 &&
+    offsetof(GrArcState, wedgeCount) == 112 && offsetof(GrArcState, stride) == 116 &&
+    offsetof(GrArcState, topRow) == 120 && offsetof(GrArcState, stepY) == 128 &&
+    offsetof(GrArcState, decision) == 160);
 
 namespace {
 
@@ -39,7 +47,7 @@ enum class End { First, Last };
 /// Trims `box`, the whole of a quadrant, to the part of the ellipse that follows the arc's first point, or
 /// leads to its last one, and makes the wedge: from the point to the centre's row, one segment runs to the
 /// centre and one straight up or down.
-GrArcState::Wedge Trim(GrRect& box, int quadrant, Point const& point, End end)
+GrWedge Trim(GrRect& box, int quadrant, Point const& point, End end)
 {
     bool const left = IsLeft(quadrant);
     bool const lower = IsLower(quadrant);
@@ -48,9 +56,8 @@ GrArcState::Wedge Trim(GrRect& box, int quadrant, Point const& point, End end)
     int const top = lower ? box.y1 : point.y;
     int const bottom = lower ? point.y : box.y2 - 1;
     int const upright = first == (left != lower) ? point.x : centre;
-    GrArcState::Wedge::Segment const toCentre{
-        lower ? centre : point.x, top, lower ? point.x : centre, bottom};
-    GrArcState::Wedge::Segment const straight{upright, top, upright, bottom};
+    GrWedge::Segment const toCentre{lower ? centre : point.x, top, lower ? point.x : centre, bottom};
+    GrWedge::Segment const straight{upright, top, upright, bottom};
 
     if (first == lower)
         box.x1 = point.x;
@@ -60,7 +67,7 @@ GrArcState::Wedge Trim(GrRect& box, int quadrant, Point const& point, End end)
         box.y1 = point.y;
     else
         box.y2 = Moved(point.y, 1);
-    return first == lower ? GrArcState::Wedge{toCentre, straight} : GrArcState::Wedge{straight, toCentre};
+    return first == lower ? GrWedge{toCentre, straight} : GrWedge{straight, toCentre};
 }
 
 /// Makes the boxes of the arc between two angles, `start` being below a full turn, and the wedges.
@@ -88,7 +95,7 @@ void MakeBoxes(GrRegion& boxes, GrArcState& arc, Box const& ellipse, int start, 
         add(ellipse.Quadrant(q));
     if (end % kQuadrant == 0) return;
     GrRect box = ellipse.Quadrant(q);
-    GrArcState::Wedge const last = Trim(box, q, ellipse.At(end), End::Last);
+    GrWedge const last = Trim(box, q, ellipse.At(end), End::Last);
     if (!oneQuadrant)
         arc.wedges[arc.wedgeCount++] = last;
     else if (IsLower(q))
@@ -109,8 +116,7 @@ GrRect QuadrantBox(int q, int x, int y, int w, int h)
 void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep, unsigned char* base,
     std::uint32_t stride, GrRegion const& clip)
 {
-    GrRegion& region = arc.region.Get();
-    region = GrRect{};
+    arc.region = GrRect{};
     arc.wedgeCount = 0;
     if (w < 1 || h < 1) return;
 
@@ -123,7 +129,7 @@ void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep,
         int const first = static_cast<int>((from % kCircle + kCircle) % kCircle);
         MakeBoxes(boxes.Get(), arc, {x, y, w, h}, first, first + std::abs(sweep));
     }
-    CutRegion(region, boxes.Get(), clip);
+    CutRegion(arc.region, boxes.Get(), clip);
 
     auto const columns = static_cast<std::uint64_t>(w);
     auto const rows = static_cast<std::uint64_t>(h);
@@ -134,7 +140,8 @@ void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep,
     arc.lowerRow = Moved(y, h / 2);
     arc.upperRow = oddRows ? arc.lowerRow : arc.lowerRow - 1;
     arc.stride = stride;
-    arc.lowerAddress = base + static_cast<std::ptrdiff_t>(arc.lowerRow) * stride;
+    arc.lowerAddress =
+        reinterpret_cast<std::uintptr_t>(base) + static_cast<std::uintptr_t>(arc.lowerRow) * stride;
     arc.upperAddress = oddRows ? arc.lowerAddress : arc.lowerAddress - stride;
 
     std::uint64_t const rowTerm = columns * columns * (oddRows ? 1 : 2);
@@ -147,7 +154,7 @@ void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep,
     arc.decision = static_cast<std::int64_t>(static_cast<std::uint64_t>(quarter) - rowTerm);
 }
 
-GrWedgeWalker::GrWedgeWalker(GrArcState::Wedge const& wedge) : a(wedge.a), b(wedge.b), y(std::min(a.y0, b.y0))
+GrWedgeWalker::GrWedgeWalker(GrWedge const& wedge) : a(wedge.a), b(wedge.b), y(std::min(a.y0, b.y0))
 {
     aEdge.Init(a.x0, a.y0, a.x1, a.y1);
     bEdge.Init(Moved(b.x0, 1), b.y0, Moved(b.x1, 1), b.y1);
@@ -180,7 +187,11 @@ bool GrWedgeWalker::NextLine(GrRect& line)
 Coverage CoverageOf(GrRect const& rect, GrRegion const& region)
 {
     std::int64_t inside = 0;
+    bool apart = true;  // else pixels are counted twice, and the region may not find them
+    int bottom = std::numeric_limits<int>::min();
     for (auto const& band : BandsOf(region)) {
+        apart = apart && band.r1 >= bottom;
+        bottom = band.r2;
         std::int64_t const rows = std::int64_t{std::min(band.r2, rect.y2)} - std::max(band.r1, rect.y1);
         if (rows <= 0) continue;
         for (auto const& range : RangesOf(band)) {
@@ -190,6 +201,6 @@ Coverage CoverageOf(GrRect const& rect, GrRegion const& region)
         }
     }
     if (inside == 0) return Coverage::None;
-    bool const all = inside == (std::int64_t{rect.x2} - rect.x1) * (std::int64_t{rect.y2} - rect.y1);
+    bool const all = apart && inside == (std::int64_t{rect.x2} - rect.x1) * (std::int64_t{rect.y2} - rect.y1);
     return all ? Coverage::All : Coverage::Part;
 }

@@ -1,20 +1,66 @@
 #pragma once
 
+#include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/edge_walker.h>
 #include <tessella/region_cut.h>
 
 #include <cstdint>
+#include <utility>
 
-/// Follows an ellipse from its middle row, or middle two rows, up and down at once. Walked as a copy of one's
-/// own, it stays in registers: nothing that is stored to pixels can reach it.
-struct GrEllipseWalk {
-    int left = 0, upperRow = 0, right = 0, lowerRow = 0;
-    unsigned char* upperAddress = nullptr;
-    unsigned char* lowerAddress = nullptr;
+/// The part of a pie that no box holds, between two straight segments that run downward: A on the left, B on
+/// the right, ends included.
+struct GrWedge {
+    struct Segment {
+        std::int32_t x0, y0, x1, y1;
+    };
+    Segment a, b;
+};
+
+/// An elliptical arc in the making. No angle is tested while drawing: the arc becomes a region, a union of
+/// boxes, which holds the arc's part of the ellipse and not the rest of it. Each box is a quarter of the
+/// ellipse's bounding box; the first and the last one are trimmed where the arc ends.
+///
+///     +------+------+
+///     |  _.--|      |      The arc from 3 o'clock to E: the upper right quarter, and what lies right of
+///     | E....|      |      E and above it in the upper left one. Of the pie, the triangle E, below E,
+///     |  \   |      |      centre is missing: a wedge.
+///     +------+------+
+struct GrArcState {
+    std::int32_t left = 0, upperRow = 0, right = 0, lowerRow = 0;
+    std::uintptr_t upperAddress = 0, lowerAddress = 0;  ///< numbers: there may be no surface at these rows
+    GrRegion region;                                    ///< where the arc may appear, within the clip
+    GrWedge wedges[2]{};
+    std::int32_t wedgeCount = 0;
     std::uint32_t stride = 0;
-    int topRow = 0;
+    std::int32_t topRow = 0;
     std::int64_t stepY = 0, stepX = 0, spanTerm = 0, rowTerm = 0;
     std::int64_t decision = 0;  ///< negative while the rows' columns have to move inward
+
+    LocalRegion storage;  ///< lends `region` what it is made in
+
+    GrArcState() { std::swap(region.bands, storage.Get().bands); }
+    ~GrArcState() { std::swap(region.bands, storage.Get().bands); }
+    GrArcState(GrArcState const&) = delete;
+    GrArcState& operator=(GrArcState const&) = delete;
+};
+
+/// Follows an ellipse from its middle row, or middle two rows, up and down at once. Being a copy, it stays in
+/// registers: nothing that is stored to pixels can reach it.
+struct GrEllipseWalk {
+    std::int32_t left, upperRow, right, lowerRow;
+    std::uintptr_t upperAddress, lowerAddress;
+    std::uint32_t const stride;
+    std::int32_t const topRow;
+    std::int64_t const stepY, stepX;
+    std::int64_t spanTerm, rowTerm, decision;
+    GrRange const rows;  ///< where there is something to paint
+
+    explicit GrEllipseWalk(GrArcState const& arc)
+        : left(arc.left), upperRow(arc.upperRow), right(arc.right), lowerRow(arc.lowerRow),
+          upperAddress(arc.upperAddress), lowerAddress(arc.lowerAddress), stride(arc.stride),
+          topRow(arc.topRow), stepY(arc.stepY), stepX(arc.stepX), spanTerm(arc.spanTerm),
+          rowTerm(arc.rowTerm), decision(arc.decision), rows(RowsOf(arc.region))
+    {}
 
     void MoveColumns()
     {
@@ -33,6 +79,11 @@ struct GrEllipseWalk {
         Subtract(decision, rowTerm);
     }
 
+    bool Meets(int row) const { return row >= rows.r1 && row < rows.r2; }
+
+    /// True if there is nothing left to paint: rows only move outward.
+    bool IsBeyond() const { return upperRow < rows.r1 && lowerRow >= rows.r2; }
+
 private:
     // The terms of ellipses that are larger than any screen wrap around.
     static void Add(std::int64_t& term, std::int64_t amount)
@@ -45,30 +96,6 @@ private:
         term =
             static_cast<std::int64_t>(static_cast<std::uint64_t>(term) - static_cast<std::uint64_t>(amount));
     }
-};
-
-/// An elliptical arc in the making. No angle is tested while drawing: the arc becomes a region, a union of
-/// boxes, which holds the arc's part of the ellipse and not the rest of it. Each box is a quarter of the
-/// ellipse's bounding box; the first and the last one are trimmed where the arc ends.
-///
-///     +------+------+
-///     |  _.--|      |      The arc from 3 o'clock to E: the upper right quarter, and what lies right of
-///     | E....|      |      E and above it in the upper left one. Of the pie, the triangle E, below E,
-///     |  \   |      |      centre is missing: a wedge.
-///     +------+------+
-struct GrArcState : GrEllipseWalk {
-    /// The part of a pie that no box holds, between two straight segments that run downward: A on the left,
-    /// B on the right, ends included.
-    struct Wedge {
-        struct Segment {
-            int x0, y0, x1, y1;
-        };
-        Segment a, b;
-    };
-
-    LocalRegion region;  ///< where the arc may appear, within the clip
-    Wedge wedges[2]{};
-    int wedgeCount = 0;
 };
 
 /// Sets up the arc in the box of `w` by `h` pixels at `x`, `y`, in surface coordinates, from angle `start` on
@@ -85,19 +112,16 @@ GrRect QuadrantBox(int q, int x, int y, int w, int h);
 /// bounds the line.
 class GrWedgeWalker {
 public:
-    explicit GrWedgeWalker(GrArcState::Wedge const& wedge);
+    explicit GrWedgeWalker(GrWedge const& wedge);
 
     /// Around both segments.
     GrRect Bounds() const;
-
-    /// The row of the next line.
-    int Row() const { return y; }
 
     /// False if there are no more lines.
     bool NextLine(GrRect& line);
 
 private:
-    GrArcState::Wedge::Segment const a, b;
+    GrWedge::Segment const a, b;
     int y;
     GrEdgeWalker aEdge, bEdge;
 };

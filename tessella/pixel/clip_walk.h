@@ -2,6 +2,8 @@
 
 #include <tessella/region.h>
 
+#include <algorithm>
+#include <limits>
 #include <span>
 
 /// The one order in which drawing walks a region: bands from top to bottom, in a band its ranges from left to
@@ -20,4 +22,14 @@ inline std::span<GrRange const> RangesOf(GrRegion::Band const& band)
 inline bool IsOneRectangle(GrRegion const& region)
 {
     return region.bands.item_count == 1 && region.bands.items[0].item_count == 1;
+}
+
+/// The rows from the first band to the last one. Bands can overlap, so any of them may be the one that
+/// reaches farthest. A region without bands has none.
+inline GrRange RowsOf(GrRegion const& region)
+{
+    GrRange rows{std::numeric_limits<int>::max(), std::numeric_limits<int>::min()};
+    for (auto const& band : BandsOf(region))
+        rows = {std::min(rows.r1, band.r1), std::max(rows.r2, band.r2)};
+    return rows;
 }

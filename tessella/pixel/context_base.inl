@@ -1,13 +1,15 @@
 #include <tessella/coordinates.h>
+#include <tessella/region_cut.h>
 
 #include <bit>
 
 template <typename State>
 void GrContextBase<State>::SetClipRegion(GrRegion const& region)
 {
-    this->clip = region;
-    this->clip.Offset(this->originX, this->originY);
-    this->clip &= this->limit;
+    LocalRegion const moved;
+    moved.Get() = region;
+    moved.Get().Offset(this->originX, this->originY);
+    CutRegion(this->clip, moved.Get(), this->limit);
 }
 
 template <typename State>

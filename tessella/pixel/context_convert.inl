@@ -39,10 +39,9 @@ void GrGenericContext<S, Colors>::ReadImage(GrRect const& src, GrImage& image, i
 template <typename S, GrColorsPolicy Colors>
 GrPixelExtent GrGenericContext<S, Colors>::ExtentOfClip() const
 {
-    GrRect outer;
-    this->clip.GetOuterRect(outer);
-    if (!this->HasPixelsIn(outer)) return {nullptr, nullptr};
-    return {this->RowAddress(outer.y1), this->RowAddress(outer.y2)};
+    if (!this->clip || !this->HasPixels()) return {nullptr, nullptr};
+    GrRange const rows = RowsOf(this->clip);
+    return {this->RowAddress(rows.r1), this->RowAddress(rows.r2)};
 }
 
 template <typename S, GrColorsPolicy Colors>
@@ -70,6 +69,7 @@ GrColor const* GrGenericContext<S, Colors>::ReadClipped(int x, int y, int count,
 template <typename S, GrColorsPolicy Colors>
 void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* source, int sx, int sy)
 {
+    if (!source) return;
     GrColorSource const colorSource(*source);
     bool const readAhead = colorSource.MayReadAhead(ExtentOfClip());
     this->WalkClip(

@@ -21,9 +21,9 @@ template <typename S>
 template <typename Walker>
 void GrGenericContextBase<S>::FillLines(GrRegion const& region, Walker& walker) const
 {
-    unsigned char* row = this->RowAddress(walker.Row());
-    for (GrRect line; walker.NextLine(line); row += this->Stride())
-        FillScan(row, region, line);
+    GrRange const rows = RowsOf(region);
+    for (GrRect line; walker.NextLine(line) && line.y1 < rows.r2;)
+        if (line.y1 >= rows.r1) FillScan(this->RowAddress(line.y1), region, line);
 }
 
 template <typename S>
@@ -126,24 +126,25 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     GrArcState arc;
     ArcSetup(arc, x, y, w, h, start, sweep, this->PixelBase(), static_cast<std::uint32_t>(this->Stride()),
         this->clip);
-    GrRegion const& region = arc.region.Get();
+    GrRegion const& region = arc.region;
     if (!region) return;
     typename S::Guard const guard(region);
+    GrEllipseWalk const walk(arc);
     Coverage quadrants[4];
     for (int q = 0; q < 4; ++q)
         quadrants[q] = CoverageOf(QuadrantBox(q, x, y, w, h), region);
     auto const isWhole = [](Coverage coverage) { return coverage == Coverage::All; };
     if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) {
-        WalkOutline(arc, [this, pixel = this->foreColor](int, unsigned char* row, int column, int) {
-            this->WritePixel(row, column, pixel);
+        WalkOutline(walk, [this, pixel = this->foreColor](int, std::uintptr_t address, int column, int) {
+            this->WritePixel(RowAt(address), column, pixel);
         });
         return;
     }
-    WalkOutline(arc, [&](int quadrant, unsigned char* row, int column, int line) {
+    WalkOutline(walk, [&](int quadrant, std::uintptr_t address, int column, int line) {
         Coverage const coverage = quadrants[quadrant];
         if (coverage == Coverage::All || (coverage == Coverage::Part && region.Contains(column, line)))
             this->PatternPixel(
-                row, column, this->pattern[line & 7], this->patternTransparent, this->rasterMode);
+                RowAt(address), column, this->pattern[line & 7], this->patternTransparent, this->rasterMode);
     });
 }
 
@@ -152,7 +153,7 @@ template <typename S>
 template <typename Paint>
 void GrGenericContextBase<S>::WalkOutline(GrEllipseWalk walk, Paint paint)
 {
-    while (walk.upperRow >= walk.topRow) {
+    for (;;) {
         paint(0, walk.upperAddress, walk.right, walk.upperRow);
         if (walk.left != walk.right) paint(1, walk.upperAddress, walk.left, walk.upperRow);
         if (walk.upperRow != walk.lowerRow) {
@@ -162,7 +163,9 @@ void GrGenericContextBase<S>::WalkOutline(GrEllipseWalk walk, Paint paint)
         }
         if (walk.right - walk.left < 2) return;
         if (walk.decision < 0) walk.MoveColumns();
-        if (walk.decision >= 0) walk.MoveRows();
+        if (walk.decision < 0) continue;
+        walk.MoveRows();
+        if (walk.IsBeyond()) return;
     }
 }
 
@@ -174,9 +177,9 @@ void GrGenericContextBase<S>::FillArc(int x, int y, int w, int h, int start, int
     ArcSetup(arc, Moved(Moved(x, this->originX), 1), Moved(Moved(y, this->originY), 1), Moved(w, -1),
         Moved(h, -1), start, sweep, this->PixelBase(), static_cast<std::uint32_t>(this->Stride()),
         this->clip);
-    if (arc.region.Get()) {
-        typename S::Guard const guard(arc.region.Get());
-        FillEllipse(arc, arc.region.Get());
+    if (arc.region) {
+        typename S::Guard const guard(arc.region);
+        FillEllipse(GrEllipseWalk(arc), arc.region);
     }
     if (arc.wedgeCount != 0) FillWedges(arc);
 }
@@ -186,9 +189,10 @@ void GrGenericContextBase<S>::FillEllipse(GrEllipseWalk walk, GrRegion const& re
 {
     for (;;) {
         int const right = Moved(walk.right, 1);
-        FillScan(walk.upperAddress, region, {walk.left, walk.upperRow, right, walk.upperRow + 1});
-        if (walk.lowerRow != walk.upperRow)
-            FillScan(walk.lowerAddress, region, {walk.left, walk.lowerRow, right, walk.lowerRow + 1});
+        if (walk.Meets(walk.upperRow))
+            FillScan(RowAt(walk.upperAddress), region, {walk.left, walk.upperRow, right, walk.upperRow + 1});
+        if (walk.Meets(walk.lowerRow) && walk.lowerRow != walk.upperRow)
+            FillScan(RowAt(walk.lowerAddress), region, {walk.left, walk.lowerRow, right, walk.lowerRow + 1});
         if (walk.upperRow <= walk.topRow) return;
         while (walk.decision < 0) {
             walk.MoveColumns();
@@ -196,6 +200,7 @@ void GrGenericContextBase<S>::FillEllipse(GrEllipseWalk walk, GrRegion const& re
             if (walk.left > walk.right) return;
         }
         walk.MoveRows();
+        if (walk.IsBeyond()) return;
     }
 }
 
@@ -206,7 +211,7 @@ void GrGenericContextBase<S>::FillWedges(GrArcState const& arc) const
     GrRegion& rest = restScratch.Get();
     GrRegion& local = cut.Get();
     rest = this->clip;
-    rest -= arc.region.Get();
+    rest -= arc.region;
     for (int i = 0; i < arc.wedgeCount; ++i) {
         GrWedgeWalker walker(arc.wedges[i]);
         CutRegion(local, this->clip, walker.Bounds());

@@ -18,7 +18,7 @@ struct GrGlyphImage : GrImage {
 };
 
 /// The back colour in the cells of an opaque text, where no glyph's box is. As long as boxes follow each
-/// other without meeting, and none reaches beyond the pen behind it, three rectangles beside each are all.
+/// other without meeting, and no box reaches beyond the pen behind it, three rectangles beside each are all.
 /// Others are cut out of a region of gaps, until the pen has passed them all.
 template <typename S>
 class GrGenericContextBase<S>::TextBack {

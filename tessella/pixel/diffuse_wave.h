@@ -15,12 +15,14 @@
 // Rows begin and end at different steps. Before its start and behind its end a row is fed with zeros, or with
 // whatever follows: errors never go to the left or upward, so that reaches no pixel of the picture.
 
+namespace wide {
+
 constexpr int kWaveRows = 16;
 constexpr int kWaveSteps = 128;  // in one go, at most
 
 /// A stretch of the rows: at step t, row k is at its column kWaveRows + t - k here. The first columns are the
 /// last of the stretch before, where lower rows have still to go.
-struct GrWaveColors {
+struct WaveColors {
     std::uint32_t rows[kWaveRows][kWaveRows + kWaveSteps];
 };
 
@@ -126,7 +128,7 @@ public:
     GR_INLINE explicit Wave(unsigned char* cells) : above(cells) {}
 
     /// Goes on by some steps, a multiple of 4, and replaces the colours by those to convert.
-    GR_INLINE void Run(GrWaveColors& colors, int steps)
+    GR_INLINE void Run(WaveColors& colors, int steps)
     {
         for (int step = 0; step < steps; step += 4, above += 4 * kCellBytes) {
             // The errors of the row above the next part, one step ago, in their last cells.
@@ -181,3 +183,5 @@ private:
     Vector left[kWaveRows / 4 * Part::kParts] = {};
     Vector down[kWaveRows / 4 * Part::kParts] = {};
 };
+
+}

@@ -77,6 +77,12 @@ protected:
     void DrawBits(int x, int y, GrBits const& bits, bool transparent);
 
 private:
+    /// The row that begins at an address of the surface.
+    unsigned char* RowAt(std::uintptr_t address) const
+    {
+        unsigned char* const base = this->PixelBase();
+        return base + static_cast<std::ptrdiff_t>(address - reinterpret_cast<std::uintptr_t>(base));
+    }
     void DrawColumn(GrRegion const& region, int x) const;
     void DrawRun(GrLineWalker line, std::uint64_t count) const;
     template <typename Paint>

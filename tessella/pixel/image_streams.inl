@@ -6,6 +6,7 @@ inline GrColor ColorAt(std::uint8_t const* bytes) { return GrMakeColor(bytes[0],
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void GrImageContext<Surface, Colors>::LoadPixels(std::uint8_t const* data, unsigned step)
 {
+    if (this->width < 1) return;
     if (Colors::kDithers && !(this->flags & GrImageNoDither)) {
         LoadPixelsDithered(data, this->alphaPlane, step);
         return;
@@ -29,7 +30,7 @@ void GrImageContext<Surface, Colors>::LoadPixelsDithered(
     std::uint8_t const* data, std::uint8_t const* alpha, unsigned step)
 {
     if constexpr (Colors::kDithers) {
-        if (!this->pixels) return;
+        if (!this->pixels || this->width < 1) return;
         GrErrorRows errors(this->ditherRows.get(), this->width);
         for (int y = 0; y < this->height; ++y) {
             errors.StartRow();
@@ -44,7 +45,7 @@ void GrImageContext<Surface, Colors>::LoadPixelsDithered(
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void GrImageContext<Surface, Colors>::UnloadPixels(std::uint8_t* data, unsigned step)
 {
-    if (!this->pixels) return;
+    if (!this->pixels || this->width < 1) return;
     for (int y = 0; y < this->height; ++y) {
         unsigned char* const row = this->RowAddress(y);
         for (int x = 0; x < this->width; ++x, data += step) {

@@ -16,9 +16,6 @@ public:
     /// Around all vertices, the largest coordinates excluded.
     GrRect const& Bounds() const { return bounds; }
 
-    /// The row of the next line.
-    int Row() const { return y; }
-
     /// False if there are no more lines. A line may be empty or lie outside the bounds.
     bool NextLine(GrRect& line);
 

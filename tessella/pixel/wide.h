@@ -15,7 +15,8 @@
 
 // Several pixels at a time, in vectors of one word a pixel, as wide as the processor's registers. Sources
 // that include this are compiled for one generation of processors each; everything here is inlined, or
-// depends on the number of lanes, so that they share no code.
+// depends on the number of lanes, so that they share no code. What is taken for narrow rows, with fewer lanes
+// than a source is there for, is inlined.
 
 #define GR_INLINE [[gnu::always_inline]] inline
 #define GR_INLINE_LAMBDA __attribute__((always_inline))

@@ -2,6 +2,8 @@
 
 #include <tessella/pixel/wide_source.h>
 
+namespace wide {
+
 inline constexpr std::uint32_t kLaneNumbers[] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
 
 template <typename Format, bool kHasColors, bool kHasAlphas>
@@ -55,4 +57,6 @@ GR_INLINE void BlendFormat(GrBlend const& blend)
     else
         blend.alphas ? BlendWide<typename Format::Unturned, false, true>(blend)
                      : BlendWide<typename Format::Unturned, false, false>(blend);
+}
+
 }

@@ -2,6 +2,8 @@
 
 #include <tessella/pixel/wide_format.h>
 
+namespace wide {
+
 template <typename Format>
 GR_INLINE void ReadWide(unsigned char const* pixels, int count, GrColor* colors)
 {
@@ -24,4 +26,6 @@ GR_INLINE void WriteWide(unsigned char* pixels, int count, GrColor const* colors
             W::template Load<std::uint32_t>(reinterpret_cast<unsigned char const*>(colors + x), count - x);
         Format::Store(pixels + std::ptrdiff_t{x} * Format::kBytes, count - x, Format::ToPixels(some));
     }
+}
+
 }

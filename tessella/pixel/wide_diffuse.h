@@ -5,6 +5,8 @@
 
 #include <algorithm>
 
+namespace wide {
+
 inline constexpr int kFewColumns = 96;  // so few that the error rows have no room for a wave's cells
 
 /// The colours of a row's columns `from` to `to`, as they are wanted before any errors come in. Those that
@@ -74,7 +76,7 @@ GR_INLINE void DiffuseWide(GrBlend const& blend)
 
     WideSource<Format, kHasColors, kHasAlphas> source(blend);
     for (int top = 0; top < height; top += kWaveRows) {
-        GrWaveColors colors{};
+        WaveColors colors{};
         TheWave wave(cells + kWaveRows * TheWave::kCellBytes);
         int const rows = std::min(kWaveRows, height - top);
         for (int start = 0; start < width + kWaveRows; start += kWaveSteps) {
@@ -108,4 +110,6 @@ GR_INLINE void DiffuseFormat(GrBlend const& blend)
     else
         blend.alphas ? DiffuseWide<Format, Part, false, true>(blend)
                      : DiffuseWide<Format, Part, false, false>(blend);
+}
+
 }

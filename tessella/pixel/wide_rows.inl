@@ -4,6 +4,8 @@
 #include <tessella/pixel/wide_diffuse.h>
 #include <tessella/pixel/wide_rows.h>
 
+// `kLanesHere` comes from the source that includes this: the lanes that it is compiled for.
+
 template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void GrWideRows<kLanes, Surface, Colors>::Blend(GrBlend const& blend)
 {
@@ -11,24 +13,24 @@ void GrWideRows<kLanes, Surface, Colors>::Blend(GrBlend const& blend)
     // Where nothing is drawn, nothing is diffused.
     bool const diffuses = blend.errors && (blend.alphas || blend.alpha != 0);
     if constexpr (Colors::kDithers)
-        if (diffuses) return DiffuseFormat<Format>(blend);
+        if (diffuses) return wide::DiffuseFormat<Format>(blend);
     // Fewer lanes waste less on narrow rows, such as those of glyphs.
     if (kLanes == 16 && blend.target.width <= 8)
-        BlendFormat<GrWideFormat<GrWide<8>, Surface, Colors>>(blend);
+        wide::BlendFormat<GrWideFormat<GrWide<8>, Surface, Colors>>(blend);
     else
-        BlendFormat<Format>(blend);
+        wide::BlendFormat<Format>(blend);
 }
 
 template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void GrWideRows<kLanes, Surface, Colors>::Read(unsigned char const* pixels, int count, GrColor* colors)
 {
-    ReadWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
+    wide::ReadWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
 }
 
 template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
 void GrWideRows<kLanes, Surface, Colors>::Write(unsigned char* pixels, int count, GrColor const* colors)
 {
-    WriteWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
+    wide::WriteWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
 }
 
 template <int kLanes, GrSurfacePolicy Surface>

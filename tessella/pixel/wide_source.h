@@ -3,6 +3,8 @@
 #include <tessella/pixel/blend.h>
 #include <tessella/pixel/wide_format.h>
 
+namespace wide {
+
 /// What the alpha values of some pixels have in common. Icons consist of runs of 0 and 255, with little
 /// between them.
 enum class AlphaRun { Clear, Opaque, Mixed };
@@ -65,3 +67,5 @@ struct WideSource {
     Words alpha;
     Words color;
 };
+
+}

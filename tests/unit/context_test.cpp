@@ -209,6 +209,29 @@ TEST(Contexts, ScreensOfEveryModeMatchTheCanvas)
     JudgeScreen<GrSurface32, GrColors24>(32, 24);
 }
 
+TEST(Contexts, BandsThatOverlapReachNothingOutside)
+{
+    GrRegion region = GrRect{10, 5, 14, 12};
+    region += GrRect{0, 16, 12, 27};
+    testing::internal::CaptureStderr();  // the bands are out of order now, which is reported
+    region += GrRect{15, -2, 21, 14};
+    std::vector<unsigned char> memory(20 * 24, 7);
+    GrImage image(20, 20, memory.data() + 20 * 2, nullptr, 0);
+    image.bits = 8;
+    image.bytes = 1;
+    std::unique_ptr<GrContext> const context(image.GetContext());
+    context->FillRegion(region);
+    context->SetClipRegion(region);
+    context->FillRegion(GrRect{-9, -9, 30, 30});
+    context->DrawLine(17, -9, 17, 30);
+    EXPECT_EQ(context->GetPixel(17, -1), 0u);
+    testing::internal::GetCapturedStderr();
+    image.Detach();
+    for (std::size_t i = 0; i < 20 * 2; ++i)
+        EXPECT_TRUE(memory[i] == 7 && memory[i + 20 * 22] == 7) << i;
+    EXPECT_EQ(memory[20 * 2 + 17], 0) << "what lies on the surface is painted";
+}
+
 TEST(Contexts, WithoutAMappingTheScreenPaintsNothing)
 {
     ResetScreen const reset;

@@ -38,9 +38,13 @@ TEST(Image, ContextFollowsTheFormat)
     EXPECT_TRUE((Gives<GrSurface32, GrColorsRGB>(0, 0, GrImageTrueColor)));
     EXPECT_TRUE((Gives<GrSurface32, GrColorsRGBA>(0, 0, GrImageTrueColor | GrImagePremultiplied)));
 
-    GrScreen.depth = 24;
-    GrScreen.createImageContext = FindVideoMode(32, 24)->createImageContext;
-    EXPECT_TRUE((Gives<GrSurface32, GrColors24>(24, 4))) << "the screen's own format comes first";
+    for (unsigned const bits : {24, 32}) {
+        GrScreen.depth = 24;
+        GrScreen.bytesPerPixel = bits / 8;
+        GrScreen.createImageContext = FindVideoMode(bits, 24)->createImageContext;
+        EXPECT_TRUE((Gives<GrSurface24, GrColors24>(24, 3) && Gives<GrSurface32, GrColors24>(24, 4)))
+            << "an image outlives the mode that it was made in";
+    }
     GrScreen = {};
 
     testing::internal::CaptureStderr();

@@ -11,7 +11,8 @@ import sys
 
 OURS = "tessella"
 CLOCK = "/process_time"  # how Google Benchmark marks the clock that main.cpp asks for
-GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills", "blits", "desktop", "figures", "archive"]
+GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills", "blits", "desktop", "figures", "archive",
+          "text", "built_in_font"]
 
 # These merge with lists of bands that the library reports as damaged, each time with the call stack. They run
 # with the reports off, which leaves the work itself, and on; all other rows report nothing and run with
@@ -56,6 +57,12 @@ GOALS = [(re.compile(row), least, aim) for row, least, aim in [
     (r"64 lines, random, ", 0.7, 0.95),
     (r"64 filled ellipses \d+x\d+, \d+ bits", 1.5, 5),
     (r"64 outlined ellipses \d+x\d+, \d+ bits", 10, 30),
+    (r"1-bit text, transparent, 32 bits,", 1.5, 5),
+    (r"1-bit text, opaque, 32 bits,", 1.0, 1.4),
+    (r"grey text, 8x16, 32 bits,", 1.0, 2),
+    (r"grey text, proportional, 32 bits,", 1.0, 1.5),
+    (r"grey text, proportional, 16 bits,", 0.8, 1.1),
+    (r"loading the built-in font$", 0.33, 0.67),
     (r"start-up: archive and key layouts$", 0.67, 0.9),
     (r"desktop ", 0.8, 1.4),
 ]]

@@ -1,38 +1,26 @@
 #include <bundle/archive_file.h>
 
+#include <common/message_table.h>
+
+#include <climits>
+#include <new>
+#include <unicode/unistr.h>
+
 using Common::LocationOf;
 
 namespace {
 
 constexpr char kFile[] = "bundle/archive_file";
 
-template <class T>
-std::string BytesOf(T const& value)
+/// As the archive has it in the language in force, in UTF-8.
+std::string MessageOf(std::shared_ptr<Archive> const& archive, MessageKey key)
 {
-    return {reinterpret_cast<char const*>(&value), sizeof value};
-}
-
-void AddText(std::string& bytes, std::string_view text)
-{
-    bytes += text;
-    bytes += '\0';
-}
-
-void AddParameter(std::string& bytes, std::string_view name, std::string_view text)
-{
-    AddText(bytes, name);
-    bytes += 'A';
-    AddText(bytes, text);
-}
-
-/// The system's part of a message may be in any encoding.
-std::string AsciiOf(std::string_view text)
-{
-    std::string ascii(text);
-    for (char& letter : ascii) {
-        if ((letter & 0x80) != 0) letter = '?';
-    }
-    return ascii;
+    unsigned size = 0;
+    auto const bytes = LoadWhole(archive, kMessageFile, size);
+    MessageCatalogue const* const catalogue = ReadCatalogue(bytes.get(), size);
+    unsigned short const* const text = TextOf(catalogue != nullptr ? *catalogue : BuiltInMessages(), key);
+    std::string message;
+    return icu::UnicodeString(reinterpret_cast<char16_t const*>(text)).toUTF8String(message);
 }
 
 }
@@ -57,8 +45,8 @@ bool ArchiveFile::Read(void* buffer, unsigned size, unsigned& count)
     count = 0;
     std::lock_guard const lock(archive->mutex);
     if (stream == nullptr) {
-        SetFailure(Common::ErrorReadFailed, "The file is not open since it could not be rewound",
-            LocationOf(kFile, "Read", __LINE__));
+        failure = {Common::ErrorReadFailed, MessageReadFailed,
+            "The file is not open since it could not be rewound", LocationOf(kFile, "Read", __LINE__)};
         return false;
     }
     zip_int64_t got = 1;
@@ -71,8 +59,9 @@ bool ArchiveFile::Read(void* buffer, unsigned size, unsigned& count)
     char beyond;
     if (got > 0 && position >= entry.size) got = zip_fread(stream, &beyond, 1);
     if (got > 0 ? position < entry.size : got == 0 && position == entry.size) return true;
-    SetFailure(Common::ErrorReadFailed, got < 0 ? zip_file_strerror(stream) : "The data is not of its size",
-        LocationOf(kFile, "Read", __LINE__));
+    failure = {Common::ErrorReadFailed, MessageReadFailed,
+        got < 0 ? zip_file_strerror(stream) : "The data is not of its size",
+        LocationOf(kFile, "Read", __LINE__)};
     return false;
 }
 
@@ -83,7 +72,8 @@ bool ArchiveFile::Rewind()
     stream = zip_fopen_index(archive->zip, entry.index, 0);
     position = 0;
     if (stream != nullptr) return true;
-    SetFailure(Common::ErrorSeekFailed, zip_strerror(archive->zip), LocationOf(kFile, "Rewind", __LINE__));
+    failure = {Common::ErrorSeekFailed, MessageSeekFailed, zip_strerror(archive->zip),
+        LocationOf(kFile, "Rewind", __LINE__)};
     return false;
 }
 
@@ -93,18 +83,22 @@ void ArchiveFile::CloseStream()
     stream = nullptr;
 }
 
-/// Keeps a chain of one record.
-void ArchiveFile::SetFailure(std::uint32_t code, std::string_view message, Common::Location const& where)
+std::string ArchiveFile::LastFailure() const
 {
-    failure = '\x01';
-    failure += BytesOf(code) + BytesOf(where.site);
-    AddText(failure, AsciiOf(message));
-    AddParameter(failure, "$file", where.file);
-    AddParameter(failure, "$func", where.function);
-    AddText(failure, "$line");
-    failure += 'N' + BytesOf(std::uint64_t{where.line});
-    AddParameter(failure, "entry", entry.name);
-    AddParameter(failure, "archive", archive->path);
-    AddText(failure, "");
-    failure += BytesOf(std::uint32_t{0});
+    if (failure.code == 0) return {};
+    return SerializeFailure(failure, MessageOf(archive, failure.key), entry.name, archive->path);
+}
+
+std::unique_ptr<unsigned char[]> LoadWhole(
+    std::shared_ptr<Archive> const& archive, std::string const& name, unsigned& size)
+{
+    auto entry = archive->Find(name);
+    auto const file = entry ? ArchiveFile::Open(archive, std::move(*entry)) : nullptr;
+    if (file == nullptr || file->Size() > UINT_MAX) return nullptr;
+    auto const wanted = static_cast<unsigned>(file->Size());
+    std::unique_ptr<unsigned char[]> data(new (std::nothrow) unsigned char[wanted]);
+    unsigned count = 0;
+    if (data == nullptr || !file->Read(data.get(), wanted, count) || count != wanted) return nullptr;
+    size = wanted;
+    return data;
 }

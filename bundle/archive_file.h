@@ -1,7 +1,7 @@
 #pragma once
 
 #include <bundle/archive.h>
-#include <common/error.h>
+#include <bundle/failure.h>
 
 #include <memory>
 #include <string>
@@ -21,19 +21,23 @@ public:
     bool Rewind();
     std::uint64_t Size() const { return entry.size; }
 
-    /// The last failure as bytes of an error chain; empty if there was none.
-    std::string const& Failure() const { return failure; }
+    /// The last failure as bytes of an error chain, in the language in force; empty if there was none.
+    std::string LastFailure() const;
 
 private:
     ArchiveFile(std::shared_ptr<Archive> from, ArchiveEntry what)
         : archive(std::move(from)), entry(std::move(what))
     {}
     void CloseStream();
-    void SetFailure(std::uint32_t code, std::string_view message, Common::Location const& where);
 
     std::shared_ptr<Archive> const archive;
     ArchiveEntry const entry;
     zip_file_t* stream = nullptr;  // guarded by the archive's mutex; null if rewinding has failed
     std::uint64_t position = 0;
-    std::string failure;
+    Failure failure;
 };
+
+/// All of the file with this name in the language in force, and its size. Null, with `size` left alone, if
+/// there is none that can be read.
+std::unique_ptr<unsigned char[]> LoadWhole(
+    std::shared_ptr<Archive> const& archive, std::string const& name, unsigned& size);

@@ -5,7 +5,6 @@
 
 #include <algorithm>
 #include <climits>
-#include <new>
 
 namespace BundleApi {
 
@@ -16,17 +15,6 @@ struct ModuleHandle {
 struct FileHandle {
     std::unique_ptr<ArchiveFile> file;
 };
-
-namespace {
-
-std::unique_ptr<ArchiveFile> Open(ModuleHandle* module, char const* name, char const* variant)
-{
-    if (module == nullptr || name == nullptr || variant != nullptr) return nullptr;
-    auto entry = module->archive->Find(name);
-    return entry ? ArchiveFile::Open(module->archive, std::move(*entry)) : nullptr;
-}
-
-}
 
 ModuleHandle* OpenModule(unsigned short const* path)
 {
@@ -43,20 +31,16 @@ void CloseModule(ModuleHandle* module) { delete module; }
 
 FileHandle* OpenFile(ModuleHandle* module, char const* name, char const* variant)
 {
-    auto file = Open(module, name, variant);
+    if (module == nullptr || name == nullptr || variant != nullptr) return nullptr;
+    auto entry = module->archive->Find(name);
+    auto file = entry ? ArchiveFile::Open(module->archive, std::move(*entry)) : nullptr;
     return file != nullptr ? new FileHandle{std::move(file)} : nullptr;
 }
 
 unsigned char* LoadFile(ModuleHandle* module, char const* name, char const* variant, unsigned int* size)
 {
-    auto const file = Open(module, name, variant);
-    if (file == nullptr || file->Size() > UINT_MAX) return nullptr;
-    auto const wanted = static_cast<unsigned>(file->Size());
-    std::unique_ptr<unsigned char[]> data(new (std::nothrow) unsigned char[wanted]);
-    unsigned count = 0;
-    if (data == nullptr || !file->Read(data.get(), wanted, count) || count != wanted) return nullptr;
-    *size = wanted;
-    return data.release();
+    if (module == nullptr || name == nullptr || variant != nullptr) return nullptr;
+    return LoadWhole(module->archive, name, *size).release();
 }
 
 bool ReadFile(FileHandle* file, void* buffer, unsigned int size, unsigned int* read)
@@ -76,8 +60,8 @@ bool RewindFile(FileHandle* file) { return file != nullptr && file->file->Rewind
 
 unsigned char* GetFileError(FileHandle* file, unsigned int* size)
 {
-    if (file == nullptr || file->file->Failure().empty()) return nullptr;
-    std::string const& failure = file->file->Failure();
+    std::string const failure = file != nullptr ? file->file->LastFailure() : std::string();
+    if (failure.empty()) return nullptr;
     auto* const bytes = new unsigned char[failure.size()];
     std::copy(failure.begin(), failure.end(), bytes);
     *size = static_cast<unsigned>(failure.size());

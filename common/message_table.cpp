@@ -79,3 +79,28 @@ static_assert(offsetof(EnglishTable, texts) - offsetof(EnglishTable, head) ==
 }
 
 MessageCatalogue const& BuiltInMessages() { return kEnglishTable.head; }
+
+MessageCatalogue const* ReadCatalogue(unsigned char const* bytes, std::size_t size)
+{
+    auto const* const catalogue = reinterpret_cast<MessageCatalogue const*>(bytes);
+    if (bytes == nullptr || size < sizeof *catalogue || catalogue->size != size ||
+        catalogue->entryCount != kEnglishTable.keySet)
+        return nullptr;
+    // Look-ups check nothing. A text that begins before the zero at the end ends there at the latest.
+    std::size_t const texts = sizeof *catalogue + kMessageCount * sizeof(std::uint32_t);
+    std::size_t const last = size - sizeof(unsigned short);
+    if (size % sizeof(unsigned short) != 0 || last < texts || bytes[last] != 0 || bytes[last + 1] != 0)
+        return nullptr;
+    for (std::size_t slot = sizeof *catalogue; slot < texts; slot += sizeof(std::uint32_t)) {
+        std::size_t const start = slot + *reinterpret_cast<std::uint32_t const*>(bytes + slot);
+        if (start % sizeof(unsigned short) != 0 || start > last) return nullptr;
+    }
+    return catalogue;
+}
+
+unsigned short const* TextOf(MessageCatalogue const& catalogue, unsigned key)
+{
+    unsigned char const* const slot =
+        reinterpret_cast<unsigned char const*>(&catalogue + 1) + key * sizeof(std::uint32_t);
+    return reinterpret_cast<unsigned short const*>(slot + *reinterpret_cast<std::uint32_t const*>(slot));
+}

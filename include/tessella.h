@@ -7,6 +7,7 @@
 #include <tessella/cursor.h>
 #include <tessella/event.h>
 #include <tessella/export.h>
+#include <tessella/font.h>
 #include <tessella/image.h>
 #include <tessella/keyboard.h>
 #include <tessella/region.h>

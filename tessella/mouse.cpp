@@ -13,7 +13,10 @@
 #include <bit>
 #include <chrono>
 #include <cstdlib>
+#include <ctime>
 #include <thread>
+
+#include <pthread.h>
 
 constinit std::mutex mouseMutex;
 constinit std::atomic<std::uint32_t> mouseButtons{7};
@@ -89,6 +92,27 @@ void OnMouseEnabledChanged()
     GrHideCursor();
 }
 
+/// Set when the session ends. Whoever ends it waits for the mouse's thread, and may hold any lock: a handler
+/// of crashes does, and the application while somebody else has the console.
+constinit std::atomic<bool> mouseStopping{false};
+
+/// The lock for a report of the mouse; not held if the session ends meanwhile.
+template <typename Mutex>
+std::unique_lock<Mutex> LockUnlessStopping(Mutex& mutex)
+{
+    constexpr long kGlance = 10'000'000;  // nanoseconds from one look at the session to the next
+    while (!mouseStopping) {
+        timespec deadline{};
+        clock_gettime(CLOCK_REALTIME, &deadline);
+        deadline.tv_nsec += kGlance;
+        deadline.tv_sec += deadline.tv_nsec / 1'000'000'000;
+        deadline.tv_nsec %= 1'000'000'000;
+        if (pthread_mutex_timedlock(mutex.native_handle(), &deadline) == 0)
+            return std::unique_lock(mutex, std::adopt_lock);
+    }
+    return std::unique_lock(mutex, std::defer_lock);
+}
+
 int Accelerated(int delta) { return std::abs(delta) > 5 ? delta * 2 : delta; }
 
 /// The kinds of event that a button's change makes, if its bit differs: `down`, or `up`, the bit above.
@@ -98,11 +122,13 @@ std::uint32_t ButtonKind(std::uint32_t before, std::uint32_t now, std::uint32_t 
     return now & button ? down << 1 : down;
 }
 
-/// Moves the pointer and queues changes of buttons and wheel. False if a change is lost. Under `mouseMutex`.
+/// Moves the pointer and queues changes of buttons and wheel. False if a change is lost, or the session ends.
+/// Under `mouseMutex`.
 bool GrMousePush(std::uint32_t kinds, std::uint32_t buttons, int x, int y)
 {
     if (kinds & GrEventMouseMove) {
-        std::scoped_lock const lock(screenMutex);
+        auto const lock = LockUnlessStopping(screenMutex);
+        if (!lock) return false;
         if (GrCursor* const cursor = currentCursor) cursor->Move(x, y);
         mouseX.store(x, kRelaxed);
         mouseY.store(y, kRelaxed);
@@ -143,7 +169,11 @@ void GrMouseStart()
     GrMouseRefresh();
 }
 
-void GrMouseStop() { StopMouseThread(); }
+void GrMouseStop()
+{
+    mouseStopping = true;
+    StopMouseThread();
+}
 
 void GrMouseRefresh()
 {
@@ -172,8 +202,8 @@ void GrMouseReport(std::uint32_t buttons, int dx, int dy, int wheel)
     int const y = std::clamp(mouseY.load(kRelaxed) + dy, 0, Side(GrScreen.height));
     bool stored = false;
     {
-        std::scoped_lock const lock(mouseMutex);
-        stored = GrMousePush(kinds, buttons, x, y);
+        auto const lock = LockUnlessStopping(mouseMutex);
+        stored = lock && GrMousePush(kinds, buttons, x, y);
     }
     if (stored) GrPostInputWake();
 }

@@ -36,7 +36,8 @@ struct MousePacket {
 /// Reads a packet of 3 bytes, or 4 of a device with a wheel.
 MousePacket DecodeMousePacket(std::span<unsigned char const> bytes);
 
-/// Start and end of the mouse's part in a session.
+/// Start and end of the mouse's part in a session. The end waits for the mouse's thread, which then gives up
+/// what it waits for: whoever ends the session may hold any lock.
 void GrMouseStart();
 void GrMouseStop();
 

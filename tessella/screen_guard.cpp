@@ -38,6 +38,12 @@ template <typename Area>
 void GrScreenGuard::Enter(Area const& area)
 {
     if (hideCount.fetch_add(1, kRelaxed) == 0) screenMutex.lock();
+    KeepClear(area);
+}
+
+template <typename Area>
+void GrScreenGuard::KeepClear(Area const& area)
+{
     if (!cursorVisible) return;
     GrCursor const* const cursor = currentCursor;
     if (cursor && Meet(area, cursor->shownRect)) GrHideCursor();
@@ -46,6 +52,10 @@ void GrScreenGuard::Enter(Area const& area)
 GrScreenGuard::GrScreenGuard(GrRegion const& region) { Enter(region); }
 
 GrScreenGuard::GrScreenGuard(GrRect const& rect) { Enter(rect); }
+
+void GrScreenGuard::Extend(GrRegion const& region) const { KeepClear(region); }
+
+void GrScreenGuard::Extend(GrRect const& rect) const { KeepClear(rect); }
 
 GrScreenGuard::~GrScreenGuard()
 {

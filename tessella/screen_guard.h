@@ -24,11 +24,18 @@ public:
     explicit GrScreenGuard(GrRect const& rect);
     ~GrScreenGuard();
 
+    /// Guards these pixels, too: as a guard within this one would, but without waiting for what was drawn last,
+    /// as every step of the counter does.
+    void Extend(GrRegion const& region) const;
+    void Extend(GrRect const& rect) const;
+
     GrScreenGuard(GrScreenGuard const&) = delete;
     GrScreenGuard& operator=(GrScreenGuard const&) = delete;
 
 private:
     template <typename Area>
     static void Enter(Area const& area);
+    template <typename Area>
+    static void KeepClear(Area const& area);
     static void PutCursorBack();
 };

@@ -1,7 +1,11 @@
 #include <tessella/session.h>
 
+#include <tessella/crash_l.h>
 #include <tessella/event_wait_l.h>
+#include <tessella/font_factory.h>
+#include <tessella/font_substitution.h>
 #include <tessella/framebuffer_l.h>
+#include <tessella/keyboard_l.h>
 #include <tessella/mouse.h>
 #include <tessella/session_state.h>
 #include <tessella/vga_l.h>
@@ -18,11 +22,14 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     sessionThread = pthread_self();
     if (!OpenFramebuffer()) return false;
     RequestVgaPorts();
+    GrKeyboardCreate();
     if (!GrSetVideoMode(width, height, depth, mode)) return false;
+    LoadFontTable();
     screenVisible = true;
     GrMouseStart();
     GrWindow::InitWindows();
     signal(SIGUSR1, [](int) {});  // harmless from now on, whoever sends it
+    InstallCrashHandler();
     grabMutex.lock();
     initialized = true;
     ClearScreen();
@@ -34,8 +41,10 @@ void GrDone()
     if (!initialized) return;
     ClearScreen();
     GrMouseStop();
+    GrKeyboardDestroy();
     GrWindow::ShutdownWindows();
     DeleteScreenContext();
+    ReleaseFontTable();
     CloseFramebuffer();
     grabMutex.unlock();
     initialized = false;

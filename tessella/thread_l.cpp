@@ -1,9 +1,16 @@
 #include <tessella/thread_l.h>
 
+#include <cerrno>
 #include <csignal>
 
 #include <poll.h>
 #include <unistd.h>
+
+namespace {
+
+bool IsLasting(int error) { return error == EFAULT || error == EINVAL || error == EBADF; }
+
+}
 
 bool InputThread::Start(void* (*body)(void*), void* argument)
 {
@@ -28,11 +35,12 @@ void InputThread::Stop()
         close(end);
 }
 
-bool InputThread::WaitForInput(int device) const
+bool InputThread::WaitForInput(int device, PollFailure failure) const
 {
     pollfd waiting[] = {{stopPipe[0], POLLIN, 0}, {device, POLLIN, 0}};
     for (;;) {
-        poll(waiting, 2, -1);
+        bool const failed = poll(waiting, 2, -1) < 0;
+        if (failed && failure == PollFailure::Ends && IsLasting(errno)) return false;
         if (waiting[0].revents & POLLIN) return false;
         if (waiting[1].revents & POLLIN) return true;
         // A device that is gone would have poll return at once for ever; a negative descriptor is passed

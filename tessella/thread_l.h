@@ -18,8 +18,11 @@ public:
     /// True from a start on, for ever: a device has one session a process.
     bool WasStarted() const { return started; }
 
+    /// What a `poll` means that fails for a reason that stays: a descriptor or an address that is none.
+    enum class PollFailure : unsigned char { Ignored, Ends };
+
     /// Waits until the device can be read; false if the thread is to end. On the thread itself.
-    bool WaitForInput(int device) const;
+    bool WaitForInput(int device, PollFailure failure) const;
 
 private:
     pthread_t thread{};

@@ -1,10 +1,9 @@
 // compile_key_layouts: makes a file keyboard.kbd of the texts that describe its layouts.
 
 #include <tools/layout_binary.h>
+#include <tools/output_file.h>
 
-#include <cerrno>
 #include <cstdio>
-#include <cstring>
 #include <limits>
 #include <string_view>
 
@@ -31,24 +30,13 @@ int Complain(std::string const& problem, int status)
 
 int WrongUsage(std::string const& problem) { return Complain(problem + " (--help tells more)", kWrongUsage); }
 
-/// 0, or the error number of what failed.
-int Write(std::string const& path, std::string_view bytes)
-{
-    std::FILE* const file = std::fopen(path.c_str(), "wb");
-    if (file == nullptr) return errno;
-    int error = std::fwrite(bytes.data(), 1, bytes.size(), file) == bytes.size() ? 0 : errno;
-    if (std::fclose(file) != 0 && error == 0) error = errno;
-    return error;
-}
-
 int Compile(std::string const& output, std::span<char const*> texts)
 {
     std::vector<tools::Layout> layouts;
     for (char const* const text : texts)
         layouts.push_back(tools::ReadLayout(text));
-    int const error = Write(output, tools::MakeLayoutFile(layouts));
-    if (error == 0) return 0;
-    return Complain(output + ": cannot be written: " + std::strerror(error), kFailed);
+    tools::WriteFile(output, tools::MakeLayoutFile(layouts));
+    return 0;
 }
 
 int Follow(std::span<char*> words)

@@ -50,8 +50,9 @@ BUNDLE_API bool GetFileSize(FileHandle* file, unsigned long long* size);
 BUNDLE_API bool RewindFile(FileHandle* file);
 
 /// What went wrong last, as bytes of an error chain (ParseErrorChain in common/error.h) in a new array that
-/// the caller deletes, and their number. Null if nothing did. The record tells the entry and the archive's
-/// file by its parameters "entry" and "archive".
+/// the caller deletes, and their number. Null if nothing did. The first record has a text in the language in
+/// force, from the archive's `tessella.msg` or else in English, and tells the entry and the archive's file by
+/// its parameters "entry" and "archive"; its reason has what the unpacker says.
 BUNDLE_API unsigned char* GetFileError(FileHandle* file, unsigned int* size);
 
 /// Ends a file, which may be null.

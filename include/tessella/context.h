@@ -8,6 +8,7 @@
 #include <cstdint>
 
 class GrBitmap;
+class GrFont;
 class GrImage;
 
 /// How `GrContext::DrawImageAlpha` blends.
@@ -112,6 +113,18 @@ public:
     /// twice: each row is painted from the edges on one side to those on the other, the rightmost column and
     /// the lowest row excluded, so that polygons with common edges share no pixel.
     virtual void FillPolygon(std::int16_t const xy[], unsigned count) = 0;
+
+    /// Draws `length` characters, each byte being one, with the pen beginning at `x` on the baseline `y`. A
+    /// character without a glyph is left out. Bitmap glyphs are drawn as by `DrawBitmapTransparent`, grey
+    /// ones blend the fore colour over what is there. Unless `transparent` is set, the back colour is painted
+    /// behind: in the boxes of the glyphs, where bitmap glyphs then ignore pattern and raster mode, and in
+    /// the rest of the cells, from the first pen to the last and as high as the font. Nothing happens if the
+    /// font is not valid. It must derive from `GrFontBase`.
+    virtual void DrawText(
+        int x, int y, unsigned char const* text, unsigned length, GrFont* font, bool transparent) = 0;
+    /// The same for 16-bit characters.
+    virtual void DrawTextW(
+        int x, int y, unsigned short const* text, unsigned length, GrFont* font, bool transparent) = 0;
 
     /// Paints the set pixels of a bitmap in the fore colour and the clear ones in the back colour, with its
     /// top left corner at `x`, `y`. Pattern and raster mode are not looked at.

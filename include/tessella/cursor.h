@@ -15,15 +15,15 @@
 ///
 /// The application makes cursors, has one shown and deletes them, on its own thread during a session. After a
 /// change of mode no cursor is current, and new ones must be made: they belong to the mode that they were
-/// made in. All else here is for the library, and not exported.
-class GrCursor {
+/// made in. All else here is for the library.
+class GR_API GrCursor {
 public:
     /// A new cursor with its hot spot, the pixel that points, at `hotX`, `hotY` of `image`, whose size is the
     /// cursor's. Cursor and caller part here: the cursor owns image and mask. The caller deletes the cursor.
     ///
     /// With a mask, of the image's size, its set pixels are shown; the image must be in the screen's format.
     /// With null, a true-colour image is blended by its alpha plane, which it must have.
-    GR_API static GrCursor* CreateInstance(GrImage* image, GrBitmap* mask, int hotX, int hotY);
+    static GrCursor* CreateInstance(GrImage* image, GrBitmap* mask, int hotX, int hotY);
 
     GrCursor(GrCursor const&) = delete;
     GrCursor& operator=(GrCursor const&) = delete;
@@ -48,15 +48,15 @@ public:
 
     /// Moves the hot spot to a point of the screen, or nothing while drawing holds the screen: then that puts
     /// the cursor to the pointer's latest place. Any thread.
-    void Move(int newX, int newY);
+    GR_INTERNAL void Move(int newX, int newY);
 
 protected:
     /// For the classes that know how to draw the shape.
-    GrCursor(GrImage* shape, GrBitmap* shapeMask, int hotSpotX, int hotSpotY);
+    GR_INTERNAL GrCursor(GrImage* shape, GrBitmap* shapeMask, int hotSpotX, int hotSpotY);
 
     /// Ceases to be current. The first thing in each destructor of a class that can be made: until then the
     /// mouse's thread may be drawing the shape.
-    void Retire();
+    GR_INTERNAL void Retire();
 
     std::unique_ptr<GrImage> const image;  ///< the shape
     std::unique_ptr<GrBitmap> const mask;  ///< null for shapes with alpha
@@ -84,7 +84,7 @@ private:
     friend class GrScreenGuard;
     friend void GrHideCursor();
 
-    GrRect PlaceAt(int atX, int atY) const;
-    void PlanShortMove(GrRect const& next);
-    void ShowAfterShortMove(int left, int top);
+    GR_INTERNAL GrRect PlaceAt(int atX, int atY) const;
+    GR_INTERNAL void PlanShortMove(GrRect const& next);
+    GR_INTERNAL void ShowAfterShortMove(int left, int top);
 };

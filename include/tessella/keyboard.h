@@ -1,5 +1,7 @@
 #pragma once
 
+#include <tessella/export.h>
+
 #include <cstdint>
 
 /// Virtual key codes, `GrEvent::vk`: which key it is, whatever the layout prints on it. A key with a
@@ -70,3 +72,21 @@ enum : std::uint32_t {
     GrVkPad0 = 0x7FB0,  ///< the others follow
     GrVkPad9 = 0x7FB9
 };
+
+/// The virtual key code of the key that types the character `ch`, a UTF-16 unit, with whatever modifiers. Of
+/// all layouts and keys that do, the first. 0 if none does; 0xFFFFFFFF before the session, when there is no
+/// keyboard.
+///
+/// This and the functions below are for the application's thread, and not for after the end of the session.
+GR_API unsigned GrFindVkForChar(unsigned ch);
+
+/// The name of the layout in force, such as u"DE", with a zero behind it: UTF-16 that belongs to the library
+/// and lives as long as the session. Null if there is nothing to choose: before the session, and with fewer
+/// than two layouts. Users change it by pressing control and shift together, with no other key between;
+/// then the window callback gets `GrEventLayoutChanged`.
+GR_API char16_t const* GrGetKeyboardLayout();
+
+/// Asks the kernel for another console, as control, alt and F1 to F10 do; the first one is 1. True if the
+/// kernel has taken the request, false without a keyboard or for a console that does not exist. A session
+/// does not let its console go yet: the request is then answered with no.
+GR_API bool SwitchToConsole(int number);

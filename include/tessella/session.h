@@ -7,6 +7,15 @@
 ///
 /// The calling thread becomes the application's thread: it holds the library from now on, and the functions
 /// below are for it alone unless they say otherwise. SIGUSR1 gets a handler that does nothing, and keeps it.
+/// SIGSEGV gets one, for good, that gives the console back by `GrDone`, reports the fault on the standard
+/// error stream and aborts.
+///
+/// The console is taken: its keyboard gives key codes, read on a thread of the library's own, the terminal
+/// passes bytes on as they are, and the kernel keeps its text off the screen. SIGUSR2 gets the handler for
+/// requests to switch the console, and keeps it. A program that ends without `GrDone` leaves the console like
+/// this. The layouts of the keys are those of the language that the environment names (LC_ALL, LC_MESSAGES,
+/// LANG) when the session begins. The session goes on without keys if no tty opens, which is told on the
+/// standard error stream, or if the layouts cannot be read, which is not.
 ///
 /// The mouse device is opened, if there is one, and read on a thread of the library's own, which takes no
 /// signals. The pointer begins in the middle of the screen. All of the screen is due for paint.
@@ -16,14 +25,16 @@
 ///
 /// False, with the references unchanged, if a session is started or has ended in this process, if there is no
 /// framebuffer device, or if its mode cannot be learned or is not supported. In the last two cases, and after
-/// the end of a session, the reason stands on the standard error stream, the device stays open, and `GrDone`
-/// does nothing. Memory that cannot be mapped is told there too, but is no failure: nothing is painted then.
+/// the end of a session, the reason stands on the standard error stream, the device stays open, the
+/// console stays taken, and `GrDone` does nothing. Memory that cannot be mapped is told there too, but is no
+/// failure: nothing is painted then.
 GR_API bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode);
 
-/// Ends the session: clears the screen, ends the input threads, unmaps and closes the framebuffer. Does
-/// nothing if there is no session. The windows must have been destroyed before, and other threads have given
-/// the library back. Called on the thread that started it. Contexts of the screen may still be deleted, and
-/// draw nothing; `GrScreen` keeps what it held, but for the context and the memory.
+/// Ends the session: clears the screen, ends the input threads, gives the console back as it was, unmaps and
+/// closes the framebuffer. Does nothing if there is no session. The windows must have been destroyed before,
+/// and other threads have given the library back. Called on the thread that started it. Contexts of the
+/// screen may still be deleted, and draw nothing; `GrScreen` keeps what it held, but for the context and the
+/// memory.
 GR_API void GrDone();
 
 /// Looks again at the mode that the driver has now and rebuilds `GrScreen` for it. All of the screen is due

@@ -19,6 +19,11 @@ inline std::span<GrRange const> RangesOf(GrRegion::Band const& band)
     return {band.items, static_cast<std::size_t>(band.item_count)};
 }
 
+inline bool IsOneRectangle(GrRegion const& region)
+{
+    return region.bands.item_count == 1 && region.bands.items[0].item_count == 1;
+}
+
 /// The rows from the first band to the last one. Bands can overlap, so any of them may be the one that reaches
 /// farthest. A region without bands has none.
 inline GrRange RowsOf(GrRegion const& region)

@@ -1,11 +1,22 @@
 template <typename S>
 template <typename Visit>
-void GrGenericContextBase<S>::WalkClip(GrRect const& target, int sx, int sy, Visit visit)
+void GrGenericContextBase<S>::WalkClip(GrRect const& target, int sx, int sy, Visit const& visit)
 {
+    // Nearly always, and needs no region of its own.
+    if (IsOneRectangle(this->clip)) {
+        auto const& band = this->clip.bands.items[0];
+        GrRange const columns{std::max(band.items[0].r1, target.x1), std::min(band.items[0].r2, target.x2)};
+        GrRange const rows{std::max(band.r1, target.y1), std::min(band.r2, target.y2)};
+        GrRect const local{columns.r1, rows.r1, columns.r2, rows.r2};
+        typename S::WalkGuard const guard(*this, local);
+        if (!local.IsEmpty() && this->HasPixels())
+            visit(columns, rows, SourceOf(sx, columns.r1, target.x1), SourceOf(sy, rows.r1, target.y1));
+        return;
+    }
     LocalRegion const cut;
     GrRegion& local = cut.Get();
     CutRegion(local, this->clip, target);
-    typename S::Guard const guard(local);
+    typename S::WalkGuard const guard(*this, local);
     if (!this->HasPixels()) return;
     for (auto const& band : BandsOf(local))
         for (auto const& range : RangesOf(band))
@@ -19,16 +30,16 @@ void GrGenericContextBase<S>::DrawBits(int x, int y, GrBits const& bits, bool tr
     GrRect const box{x, y, Moved(x, bits.width), Moved(y, bits.height)};
     WalkClip(box, 0, 0, [&](GrRange xRange, GrRange yRange, int firstColumn, int bitsRow) {
         unsigned char* row = this->RowAddress(yRange.r1);
+        if (!transparent || this->IsSolid())
+            return PaintBits<typename S::Width>({{this->PixelAddress(row, xRange.r1), this->Stride(),
+                                                     xRange.r2 - xRange.r1, yRange.r2 - yRange.r1},
+                bits, firstColumn, bitsRow, this->foreColor, this->backColor, transparent});
         for (int rowY = yRange.r1; rowY < yRange.r2; ++rowY, ++bitsRow, row += this->Stride()) {
             std::uint8_t const patternByte = this->pattern[rowY & 7];
             int column = firstColumn;
-            for (int pixelX = xRange.r1; pixelX < xRange.r2; ++pixelX, ++column) {
-                bool const set = bits.IsSet(bitsRow, column);
-                if (!transparent)
-                    this->WritePixel(row, pixelX, set ? this->foreColor : this->backColor);
-                else if (set)
+            for (int pixelX = xRange.r1; pixelX < xRange.r2; ++pixelX, ++column)
+                if (bits.IsSet(bitsRow, column))
                     this->PatternPixel(row, pixelX, patternByte, this->patternTransparent, this->rasterMode);
-            }
         }
     });
 }

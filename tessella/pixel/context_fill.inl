@@ -2,8 +2,7 @@ template <typename S>
 void GrGenericContextBase<S>::GetClipRect(GrRect& rect)
 {
     this->clip.GetOuterRect(rect);
-    rect = {SeenFrom(rect.x1, this->originX), SeenFrom(rect.y1, this->originY),
-        SeenFrom(rect.x2, this->originX), SeenFrom(rect.y2, this->originY)};
+    rect = InContext(rect);
 }
 
 template <typename S>

@@ -1,9 +1,10 @@
 #pragma once
 
 #include <common/assert.h>
-#include <tessella/bitmap.h>
 #include <tessella/coordinates.h>
+#include <tessella/font.h>
 #include <tessella/pixel/arc.h>
+#include <tessella/pixel/bits_rows.h>
 #include <tessella/pixel/blend_rows.h>
 #include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/color_source.h>
@@ -14,29 +15,6 @@
 #include <tessella/pixel/line_walker.h>
 #include <tessella/pixel/polygon_walker.h>
 #include <tessella/region_cut.h>
-
-/// A picture of one bit a pixel. Its rows begin `pitch` bytes apart, the leftmost pixel in the highest or the
-/// lowest bit of a byte; or, with a pitch of 0, follow each other bit by bit, always the lowest first.
-struct GrBits {
-    std::uint8_t const* data;
-    int width, height;
-    int pitch;
-    bool msbFirst;
-
-    bool IsSet(int row, int column) const
-    {
-        std::ptrdiff_t const index = pitch == 0 ? std::ptrdiff_t{row} * width + column
-            : msbFirst                          ? column ^ 7
-                                                : column;
-        return data[std::ptrdiff_t{row} * pitch + index / 8] >> index % 8 & 1;
-    }
-};
-
-inline GrBits BitsOf(GrBitmap const& bitmap)
-{
-    int const pitch = static_cast<int>((static_cast<unsigned>(bitmap.width) + 7) / 8);
-    return {bitmap.data, bitmap.width, bitmap.height, pitch, false};
-}
 
 /// The drawing operations that move pixel values converted once, when the colour was set. `S` is the surface
 /// layer: where the pixels lie, and how wide they are.
@@ -53,6 +31,16 @@ public:
     void DrawArc(int x, int y, int w, int h, int start, int sweep) override;
     void FillArc(int x, int y, int w, int h, int start, int sweep) override;
     void FillPolygon(std::int16_t const xy[], unsigned count) override;
+    void DrawText(
+        int x, int y, unsigned char const* text, unsigned length, GrFont* font, bool transparent) override
+    {
+        DrawCharacters(x, y, text, length, *font, transparent);
+    }
+    void DrawTextW(
+        int x, int y, unsigned short const* text, unsigned length, GrFont* font, bool transparent) override
+    {
+        DrawCharacters(x, y, text, length, *font, transparent);
+    }
     void DrawBitmap(int x, int y, GrBitmap const& bitmap) override;
     void DrawBitmapTransparent(int x, int y, GrBitmap const& bitmap) override;
     void DrawImageMasked(
@@ -66,12 +54,17 @@ protected:
     using S::S;
 
     GrRect OnSurface(GrRect const& rect) const { return Moved(rect, this->originX, this->originY); }
+    GrRect InContext(GrRect const& rect) const
+    {
+        return {SeenFrom(rect.x1, this->originX), SeenFrom(rect.y1, this->originY),
+            SeenFrom(rect.x2, this->originX), SeenFrom(rect.y2, this->originY)};
+    }
 
     /// Visits the clip within `target` (surface coordinates), range by range, with the screen's guard held:
     /// `visit` gets the range's columns and rows and the source point that goes to its top left, while `sx`,
     /// `sy` goes to that of the target.
     template <typename Visit>
-    void WalkClip(GrRect const& target, int sx, int sy, Visit visit);
+    void WalkClip(GrRect const& target, int sx, int sy, Visit const& visit);
 
     /// False for rectangles that select no pixel, or where there are none.
     bool HasPixelsIn(GrRect const& rect) const { return !rect.IsEmpty() && this->HasPixels(); }
@@ -103,6 +96,13 @@ private:
     /// The same with all lines that `walker` gives, one in each row.
     template <typename Walker>
     void FillLines(GrRegion const& region, Walker& walker) const;
+
+    class TextBack;
+    template <typename Character>
+    void DrawCharacters(int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent);
+    /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; and once more, a pixel beside it.
+    [[gnu::always_inline]] void StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
+    void Embolden(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
 };
 
 /// The drawing operations that convert between colours and pixels.
@@ -149,3 +149,4 @@ private:
 #include <tessella/pixel/context_convert.inl>
 #include <tessella/pixel/context_fill.inl>
 #include <tessella/pixel/context_shapes.inl>
+#include <tessella/pixel/context_text.inl>

@@ -54,6 +54,13 @@ protected:
         explicit Guard(GrRegion const&) {}
         explicit Guard(GrRect const&) {}
     };
+    struct TextGuard {
+        explicit TextGuard(GrImageContextBase const&) {}
+    };
+    struct WalkGuard {
+        WalkGuard(GrImageContextBase const&, GrRegion const&) {}
+        WalkGuard(GrImageContextBase const&, GrRect const&) {}
+    };
 
     /// False over an image that has alpha values only.
     bool HasPixels() const { return pixels != nullptr; }

@@ -5,6 +5,7 @@
 #include <tessella/screen_guard.h>
 
 #include <cstddef>
+#include <optional>
 
 /// The fields of a screen context. Surface coordinates are screen coordinates.
 struct GrScreenContextState : GrContext {
@@ -30,9 +31,44 @@ protected:
     /// Held around every access to pixels.
     using Guard = GrScreenGuard;
 
+    /// Held around a string of text, over nothing: the cursor only goes where glyphs land.
+    class TextGuard {
+    public:
+        explicit TextGuard(GrScreenContextBase& drawnContext) : context(drawnContext)
+        {
+            context.textGuard = &guard;
+        }
+        ~TextGuard() { context.textGuard = nullptr; }
+        TextGuard(TextGuard const&) = delete;
+        TextGuard& operator=(TextGuard const&) = delete;
+
+    private:
+        GrScreenContextBase& context;
+        GrScreenGuard const guard{GrRect{}};
+    };
+
+    /// The guard of one walk over the clip; within a text's, that is extended.
+    class WalkGuard {
+    public:
+        template <typename Area>
+        WalkGuard(GrScreenContextBase const& context, Area const& area)
+        {
+            if (context.textGuard)
+                context.textGuard->Extend(area);
+            else
+                own.emplace(area);
+        }
+
+    private:
+        std::optional<GrScreenGuard> own;
+    };
+
     /// False while there is no mapping, or the kernel refused it: nothing is painted then.
     static bool HasPixels();
     static unsigned char* PixelBase() { return GrScreen.fbMemory; }
     static std::ptrdiff_t Stride() { return GrScreen.stride; }
     static std::int32_t* ErrorRows() { return GrScreen.ditherLine; }
+
+private:
+    GrScreenGuard const* textGuard = nullptr;  // while text is drawn
 };

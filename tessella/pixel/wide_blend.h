@@ -55,7 +55,8 @@ GR_INLINE void BlendFormat(GrBlend const& blend)
     if (blend.colors)
         blend.alphas ? BlendWide<Format, true, true>(blend) : BlendWide<Format, true, false>(blend);
     else
-        blend.alphas ? BlendWide<Format, false, true>(blend) : BlendWide<Format, false, false>(blend);
+        blend.alphas ? BlendWide<typename Format::Unturned, false, true>(blend)
+                     : BlendWide<typename Format::Unturned, false, false>(blend);
 }
 
 }

@@ -6,6 +6,12 @@
 
 #include <type_traits>
 
+/// The three bytes of a pixel as they lie there, whichever is red: for colours whose channels all fare alike,
+/// and without running over.
+struct GrColorsUnturned : GrColors24 {
+    static constexpr GrColor FromPixel(Pixel pixel) { return pixel; }
+};
+
 /// A format in the vectors of `W`, a `GrWide`.
 template <typename W, GrSurfacePolicy Surface, GrColorsPolicy Colors>
 struct GrWideFormat {
@@ -14,6 +20,10 @@ struct GrWideFormat {
     using Channels = typename W::Channels;
     using Policy = Colors;
     static constexpr int kBytes = Surface::kBytes;
+
+    /// The same for the fore colour alone: what alpha values leave of two colours never runs over.
+    using Unturned = GrWideFormat<W, Surface,
+        std::conditional_t<std::is_same_v<Colors, GrColors24>, GrColorsUnturned, Colors>>;
 
     /// Moves up to `count` pixels, one in each word.
     GR_INLINE static Words Load(unsigned char const* from, int count)
@@ -47,7 +57,8 @@ struct GrWideFormat {
             for (std::uint32_t& word : words)
                 word = GrColors8::FromPixel(static_cast<std::uint8_t>(word));
             return W::At(words);
-        } else if constexpr (std::is_same_v<Colors, GrColorsRGB>) {
+        } else if constexpr (std::is_same_v<Colors, GrColorsRGB> ||
+            std::is_same_v<Colors, GrColorsUnturned>) {
             return pixels;
         } else {
             return W::Join(Split(pixels));
@@ -83,6 +94,8 @@ struct GrWideFormat {
             return (colors << 8 & 0xF800) | (colors >> 5 & 0x07E0) | (colors >> 19 & 0x001F);
         } else if constexpr (std::is_same_v<Colors, GrColors24>) {
             return W::Turned(colors & 0x00FF00FF) | (colors & 0xFF00);
+        } else if constexpr (std::is_same_v<Colors, GrColorsUnturned>) {
+            return colors & 0x00FFFFFF;
         } else {
             return colors;
         }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <tessella/pixel/bits.h>
 #include <tessella/pixel/blend.h>
 
 #include <type_traits>
@@ -15,7 +16,14 @@ struct GrWideRows {
     static void Write(unsigned char* pixels, int count, GrColor const* colors);
 };
 
-/// There are none for 16 colours, which are looked up one by one, and for premultiplied colours, which are
+/// The same for bits, on one surface.
+template <int kLanes, GrSurfacePolicy Surface>
+struct GrWideBits {
+    /// As `PaintBits`.
+    static void Paint(GrBitsBox const& box);
+};
+
+/// There are no rows for 16 colours, which are looked up one by one, and for premultiplied colours, which are
 /// divided.
 template <typename Colors>
 constexpr bool kHasWideRows = !std::is_same_v<Colors, GrColors4> && !std::is_same_v<Colors, GrColorsRGBA>;

@@ -1,3 +1,4 @@
+#include <tessella/pixel/wide_bits.h>
 #include <tessella/pixel/wide_blend.h>
 #include <tessella/pixel/wide_convert.h>
 #include <tessella/pixel/wide_diffuse.h>
@@ -13,7 +14,11 @@ void GrWideRows<kLanes, Surface, Colors>::Blend(GrBlend const& blend)
     bool const diffuses = blend.errors && (blend.alphas || blend.alpha != 0);
     if constexpr (Colors::kDithers)
         if (diffuses) return wide::DiffuseFormat<Format>(blend);
-    wide::BlendFormat<Format>(blend);
+    // Fewer lanes waste less on narrow rows, such as those of glyphs.
+    if (kLanes == 16 && blend.target.width <= 8)
+        wide::BlendFormat<GrWideFormat<GrWide<8>, Surface, Colors>>(blend);
+    else
+        wide::BlendFormat<Format>(blend);
 }
 
 template <int kLanes, GrSurfacePolicy Surface, GrColorsPolicy Colors>
@@ -28,6 +33,19 @@ void GrWideRows<kLanes, Surface, Colors>::Write(unsigned char* pixels, int count
     wide::WriteWide<GrWideFormat<GrWide<kLanes>, Surface, Colors>>(pixels, count, colors);
 }
 
+template <int kLanes, GrSurfacePolicy Surface>
+void GrWideBits<kLanes, Surface>::Paint(GrBitsBox const& box)
+{
+    if (kLanes == 16 && box.target.width <= 8)
+        wide::PaintBitsOf<GrWide<8>, Surface>(box);
+    else
+        wide::PaintBitsOf<GrWide<kLanes>, Surface>(box);
+}
+
+template struct GrWideBits<kLanesHere, GrSurface8>;
+template struct GrWideBits<kLanesHere, GrSurface16>;
+template struct GrWideBits<kLanesHere, GrSurface24>;
+template struct GrWideBits<kLanesHere, GrSurface32>;
 template struct GrWideRows<kLanesHere, GrSurface8, GrColors8>;
 template struct GrWideRows<kLanesHere, GrSurface16, GrColors15>;
 template struct GrWideRows<kLanesHere, GrSurface16, GrColors16>;

@@ -32,10 +32,10 @@ struct WideSource {
         std::ptrdiff_t const index = y * blend.sourceWidth + x;
         if constexpr (kHasColors) color = W::template Load<std::uint32_t>(blend.colors + index * 4, count);
         if constexpr (kHasAlphas) {
-            unsigned char few[W::kLanes] = {};
+            unsigned char few[W::kLanes];
             unsigned char const* alphas = blend.alphas + index;
             if (count < W::kLanes) [[unlikely]] {
-                std::memcpy(few, alphas, static_cast<std::size_t>(count));
+                W::CopyFirst(few, alphas, count);
                 alphas = few;
             }
             using Some = std::conditional_t<sizeof few == 4, std::uint32_t, std::uint64_t>;
@@ -56,9 +56,10 @@ struct WideSource {
     /// The colours over pixels of the target. They mean something only where the alpha is neither 0 nor 255.
     GR_INLINE Words MixedOver(Words const& pixels) const
     {
+        auto const factors = W::Factors(alpha);
         typename W::Channels channels = W::Split(color);
-        if constexpr (!kHasColors || !kHasAlphas) channels = W::Scaled(channels, alpha);
-        return W::Mixed(channels, Format::Split(pixels), alpha);
+        if constexpr (!kHasColors || !kHasAlphas) channels = W::Scaled(channels, factors);
+        return W::Mixed(channels, Format::Split(pixels), factors);
     }
 
     GrBlend const blend;  // a copy: no store can change it

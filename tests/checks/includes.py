@@ -17,14 +17,15 @@ NEVER = [
      rf"(?!include/tessella/(region|types|export)\.h|tessella/coordinates\.h|include/common/assert\.h"
      rf"|tessella/region|{CXX_LIBRARY}|<immintrin\.h>).*",
      "a region knows coordinates and assertions only"),
-    (r"tessella/pixel/.*", r"(include/)?tessella/(window|event|mouse|keyboard|key_layout|cursor|font|cgf|session_(l|state)).*",
+    (r"tessella/pixel/.*", r"(include/)?tessella/(window|event|mouse|keyboard|key_layout|cursor|font_|cgf|session_(l|state)).*",
      "a context knows a region, not who wants it"),
     (r"(include/)?tessella/(?!pixel/|video_mode|image).*", r"tessella/pixel/.*",
      "only the mode's two factories know pixel formats"),
     (r"tessella/(mouse|keyboard)_l.*", r"(include/)?tessella/(window|key_layout).*",
      "device threads push and wake"),
     (PUBLIC, rf"(?!{PUBLIC}|{CXX_LIBRARY}|<sys/time\.h>).*", "the boundary is the product"),
-    (r"examples/.*", r"(?!include/tessella|<).*", "examples have what applications have"),
+    (r"examples/(?!gallery/).*", r"(?!include/tessella|<).*", "examples have what applications have"),
+    (r"examples/gallery/.*", r"(?!include/tessella|examples/gallery/|<).*", "examples have what applications have"),
     (r"(?!tests/).*", r"tests/.*", "production never knows its tests"),
 ]
 

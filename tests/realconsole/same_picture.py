@@ -1,6 +1,7 @@
 """Runs programs on a real framebuffer console and on the virtual console: both must show the same screen."""
 
 import argparse
+import os
 import shutil
 import subprocess
 import sys
@@ -20,13 +21,13 @@ class Difference(Exception):
 def main() -> int:
     options = parse_options()
     try:
-        programs = [options.example, options.pattern, *(program for program, _ in options.play)]
+        programs = [options.example, options.pattern, options.state, *(play[0] for play in options.play)]
         with machine.boot(options.bits, programs, options.kernel, options.keep) as real:
             # The example first: it is to meet the screen as the kernel leaves it.
             compare_program(real, options, options.example)
             compare_program(real, options, options.pattern)
-            for program, path in options.play:
-                compare_script(real, options, program, path)
+            for program, path, language in options.play:
+                compare_script(real, options, program, path, str(language))
     except (
         Difference, machine.MachineError, machine.MissingPart, script.ScriptError, ValueError, OSError
     ) as error:
@@ -41,9 +42,10 @@ def parse_options() -> argparse.Namespace:
     parser.add_argument("--example", type=Path, required=True, help="holds its picture with --hold")
     parser.add_argument("--pattern", type=Path, required=True, help="the same, and tells of the device")
     parser.add_argument(
-        "--play", type=Path, nargs=2, action="append", default=[], metavar=("PROGRAM", "SCRIPT"),
+        "--play", type=Path, nargs=3, action="append", default=[], metavar=("PROGRAM", "SCRIPT", "LANGUAGE"),
         help="both consoles' users follow the script; may be repeated",
     )
+    parser.add_argument("--state", type=Path, required=True, help="tells how a console is set up")
     parser.add_argument("--console", type=Path, required=True, help="the virtual console")
     parser.add_argument("--kernel", type=Path, required=True, help="what scripts/fetch-kernel left")
     parser.add_argument("--keep", type=Path, required=True, help="the folder for pictures and logs")
@@ -68,16 +70,18 @@ def compare_program(real: machine.Machine, options: argparse.Namespace, program:
     compare_screens(real_screen, virtual_screen, stem)
 
 
-def compare_script(real: machine.Machine, options: argparse.Namespace, program: Path, path: Path) -> None:
+def compare_script(
+    real: machine.Machine, options: argparse.Namespace, program: Path, path: Path, language: str
+) -> None:
     """The program writes the same, and shows the same at each of the script's screenshots."""
     steps = script.read_steps(options.console, path)
     names = [step.split()[1] for step in steps if step.startswith("screenshot ")]
-    real_folder, virtual_folder = (options.keep / program.name / kind for kind in ("real", "virtual"))
+    real_folder, virtual_folder = (options.keep / f"{program.name}.{language}" / kind for kind in ("real", "virtual"))
     for folder in (real_folder, virtual_folder):
         shutil.rmtree(folder, ignore_errors=True)
         folder.mkdir(parents=True)
-    virtual_words = run_virtually(options, program, ["--script", path], virtual_folder)
-    real_words = script.Player(real, real_folder).play(steps, program)
+    virtual_words = run_virtually(options, program, ["--script", path], virtual_folder, language)
+    real_words = script.Player(real, real_folder, options.state).play(steps, program, language)
     if virtual_words != real_words:
         for folder, words in ((real_folder, real_words), (virtual_folder, virtual_words)):
             folder.with_suffix(".txt").write_text("\n".join(words), encoding="utf-8")
@@ -96,13 +100,13 @@ def run_on_virtual_console(
 
 
 def run_virtually(
-    options: argparse.Namespace, program: Path, further: list, folder: Path | None = None
+    options: argparse.Namespace, program: Path, further: list, folder: Path | None = None, language: str = "C"
 ) -> list[str]:
     command = [options.console, "--mode", f"1024x768x{options.bits}", *further, "--", program]
     try:
         result = subprocess.run(
             command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True, cwd=folder,
-            timeout=VIRTUAL_SECONDS, check=False,
+            env=os.environ | {"LC_ALL": language}, timeout=VIRTUAL_SECONDS, check=False,
         )
     except subprocess.TimeoutExpired:
         raise Difference(f"{program.name} does not end on the virtual console") from None

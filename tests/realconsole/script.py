@@ -1,5 +1,6 @@
 """Plays the virtual console's scripts on a machine: the same user sits at the real console."""
 
+import re
 import subprocess
 import time
 from pathlib import Path
@@ -19,7 +20,7 @@ OPENED_SECONDS = 0.5
 PLUG_MOUSE = "insmod /mouse.ko; until grep -q Mouse /proc/bus/input/devices; do usleep 50000; done"
 # In the background: the machine stays free for further commands.
 START = (
-    "rm -f /tmp/status; (sh -c 'echo $$ > /tmp/pid; exec {program} > /tmp/output 2>&1';"
+    "rm -f /tmp/status; (sh -c 'echo $$ > /tmp/pid; exec env LC_ALL={language} {program} > /tmp/output 2>&1';"
     " echo $? > /tmp/status) < /dev/null 2> /dev/null &"
 )
 AWAIT = "until {condition}; do [ ! -e /tmp/status ] || exit 1; usleep 50000; done"
@@ -28,6 +29,11 @@ HAS_SCREEN = "grep -q /dev/fb /proc/$(cat /tmp/pid)/maps"
 IS_SHOWN = "grep -qx tty{number} /sys/class/tty/tty0/active"
 HAS_ENDED = "[ -e /tmp/status ]"
 TERMINATED = 128 + 15
+
+# How a program that reads raw keys and draws has set up the console, and what of that outlives its death: the
+# kernel resets a terminal that nobody has open.
+TAKEN = re.compile(r"keys 2 screen 1 switch 1 input \w+ output \w+ local \w*0 ")
+LEFT = re.compile(r"keys 2 screen 1 switch 1 ")
 
 
 class ScriptError(Exception):
@@ -43,25 +49,38 @@ def read_steps(console: Path, script: Path) -> list[str]:
 class Player:
     """Sits at a machine. Screenshots go to the folder, under the names that the script gives them."""
 
-    def __init__(self, real: machine.Machine, folder: Path) -> None:
+    def __init__(self, real: machine.Machine, folder: Path, state: Path) -> None:
         self._real = real
+        self._state = state
         self._folder = folder
         self._buttons = 0
         self._opened: set[str] = set()
 
-    def play(self, steps: list[str], program: object) -> list[str]:
-        """Starts the program and returns what it wrote, on both streams, when it has ended."""
+    def play(self, steps: list[str], program: object, language: str) -> list[str]:
+        """Starts the program and returns what it wrote, on both streams, when it has ended. It has the
+        console meanwhile; if it ends by itself, the console is as it was, else nobody has given it back."""
         self._real.run(PLUG_MOUSE)
-        self._real.run(START.format(program=program))
+        before = self._console_state()
+        self._real.run(START.format(program=program, language=language))
         for step in steps:
             command, *words = step.split()
             getattr(self, f"_{command}")(*words)
+            if command == "screenshot":
+                self._check_console(TAKEN)
         self._await(HAS_ENDED)
         status = int(self._real.run("cat /tmp/status")[1][0])
         output = self._real.run("cat /tmp/output")[1]
         if status != (TERMINATED if steps[-1] == "quit" else 0):
             raise ScriptError(f"{program} ended with status {status}: {output}")
+        self._check_console(LEFT if steps[-1] == "quit" else re.compile(re.escape(before)))
         return output
+
+    def _console_state(self) -> str:
+        return self._real.run(self._state)[1][0]
+
+    def _check_console(self, expected: re.Pattern) -> None:
+        if not expected.match(self._console_state()):
+            raise ScriptError(f"the console is {self._console_state()}, but should be {expected.pattern}")
 
     def _await(self, condition: str) -> None:
         if self._real.run(AWAIT.format(condition=condition))[0] != 0:

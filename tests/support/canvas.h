@@ -132,9 +132,25 @@ public:
     }
     void Paint(int x, int y)
     {
-        if (!InClip(x, y)) return;
-        bool const set = pattern[y % 8][x % 8];
-        if (set || !transparent) Write(x, y, copies ? (set ? fore : back) : ~Read(x, y));
+        if (!InClip(x, y) || !PatternPaints(x, y)) return;
+        Write(x, y, !copies ? ~Read(x, y) : pattern[y % 8][x % 8] ? fore : back);
+    }
+    bool PatternPaints(int x, int y) const { return pattern[y % 8][x % 8] || !transparent; }
+
+    /// A colour over another one; `share` of 256 of it, unless it was multiplied by its alpha already.
+    static GrColor Mixed(GrColor color, GrColor under, int alpha, int share)
+    {
+        GrColor mixed = 0xFF000000;
+        for (int shift = 0; shift < 24; shift += 8) {
+            int const own = color >> shift & 255, other = under >> shift & 255;
+            mixed |= static_cast<GrColor>(own * share / 256 + other * (255 - alpha) / 256) << shift;
+        }
+        return mixed;
+    }
+
+    bool InClip(int x, int y) const
+    {
+        return x >= 0 && y >= 0 && x < width && y < height && clip[static_cast<std::size_t>(y * width + x)];
     }
 
 private:
@@ -144,10 +160,6 @@ private:
         for (int y = 0; y < height; ++y)
             for (int x = 0; x < width; ++x)
                 visit(x, y, static_cast<std::size_t>(y * width + x));
-    }
-    bool InClip(int x, int y) const
-    {
-        return x >= 0 && y >= 0 && x < width && y < height && clip[static_cast<std::size_t>(y * width + x)];
     }
     std::size_t Offset(int x, int y) const { return static_cast<std::size_t>(y * stride + x * format.bytes); }
 

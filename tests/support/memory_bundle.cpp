@@ -11,7 +11,8 @@ namespace BundleApi {
 
 struct ModuleHandle {};
 struct FileHandle {
-    std::string_view rest = "data";
+    explicit FileHandle(std::string_view data) : whole(data), rest(data) {}
+    std::string_view whole, rest;
 };
 
 static unsigned char* NewCopy(std::string_view data, unsigned* size)
@@ -37,12 +38,15 @@ void CloseModule(ModuleHandle* module)
 
 FileHandle* OpenFile(ModuleHandle* module, char const* name, char const* /*variant*/)
 {
-    return module != nullptr && *name == 'f' ? ++memoryBundle.openFiles, new FileHandle : nullptr;
+    auto const file = memoryBundle.files.find(name);
+    if (module == nullptr || file == memoryBundle.files.end()) return nullptr;
+    ++memoryBundle.openFiles;
+    return new FileHandle(file->second);
 }
 
 unsigned char* LoadFile(ModuleHandle* module, char const* /*name*/, char const* /*variant*/, unsigned* size)
 {
-    return module != nullptr ? NewCopy("data", size) : nullptr;
+    return module != nullptr ? NewCopy(memoryBundle.loaded, size) : nullptr;
 }
 
 bool ReadFile(FileHandle* file, void* buffer, unsigned size, unsigned* read)
@@ -53,9 +57,17 @@ bool ReadFile(FileHandle* file, void* buffer, unsigned size, unsigned* read)
     return memoryBundle.Call();
 }
 
-bool GetFileSize(FileHandle* /*file*/, unsigned long long* size) { return *size = 4, memoryBundle.Call(); }
+bool GetFileSize(FileHandle* file, unsigned long long* size)
+{
+    *size = file->whole.size();
+    return memoryBundle.Call();
+}
 
-bool RewindFile(FileHandle* file) { return *file = {}, memoryBundle.Call(); }
+bool RewindFile(FileHandle* file)
+{
+    file->rest = file->whole;
+    return memoryBundle.Call();
+}
 
 unsigned char* GetFileError(FileHandle* /*file*/, unsigned* size)
 {
@@ -66,6 +78,18 @@ void CloseFile(FileHandle* file)
 {
     delete file;
     --memoryBundle.openFiles;
+}
+
+void SubscribeLanguageEvents(void (*callback)())
+{
+    memoryBundle.callback = callback;
+    ++memoryBundle.subscriptions;
+    if (memoryBundle.callsBack) callback();
+}
+
+void UnsubscribeLanguageEvents(void (*callback)())
+{
+    if (callback == memoryBundle.callback) std::puts("unsubscribed");
 }
 
 }

@@ -298,13 +298,7 @@ private:
             if (alpha < 255) {
                 GrColor const under =
                     format.fromPixel(params.overDestination ? canvas.Read(x, y) : canvas.back);
-                GrColor mixed = 0xFF000000;
-                for (int shift = 0; shift < 24; shift += 8) {
-                    int const own = color >> shift & 255, other = under >> shift & 255;
-                    int const share = hasPixels && !params.uniformAlpha ? own : own * alpha / 256;
-                    mixed |= static_cast<GrColor>(share + other * (255 - alpha) / 256) << shift;
-                }
-                color = mixed;
+                color = Canvas::Mixed(color, under, alpha, hasPixels && !params.uniformAlpha ? 256 : alpha);
                 pixel = format.toPixel(color);
             }
             if (params.dither && format.dithers) pixel = errors.Diffuse(format, color, x - range.x1);

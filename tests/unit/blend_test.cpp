@@ -23,7 +23,8 @@ void JudgeRows()
     std::mt19937 random(NewSeed());
     for (unsigned round = 0; round < 150; ++round) {
         bool const all = round == 0;
-        unsigned const width = all ? 256 : 1 + random() % 300, height = all ? 256 : 1 + random() % 35;
+        unsigned const width = all ? 256 : 1 + random() % (round % 2 ? 300 : 20),
+                       height = all ? 256 : 1 + random() % 35;
         std::size_t const area = width * height;
         std::vector<unsigned char> target(area * Surface::kBytes), alphas(area), written(target);
         std::vector<GrColor> colors(area), read(area);
@@ -67,6 +68,35 @@ void JudgeRows()
     }
 }
 
+template <int kLanes, typename Surface>
+void JudgeBits()
+{
+    std::mt19937 random(NewSeed());
+    auto const number = [&](int below) { return static_cast<int>(random() % static_cast<unsigned>(below)); };
+    for (int round = 0; round < 500; ++round) {
+        GrBits bits{nullptr, 1 + number(round % 2 ? 80 : 12), 1 + number(20), 0, number(2) != 0};
+        if (number(2)) bits.pitch = (bits.width + 7) / 8 + number(3);
+        int const last =
+            bits.pitch ? (bits.height - 1) * bits.pitch * 8 + bits.width : bits.width * bits.height;
+        std::vector<unsigned char> data(static_cast<std::size_t>(last + 7) / 8), actual(30000),
+            expected(actual);
+        for (auto& byte : data)
+            byte = static_cast<unsigned char>(random());
+        bits.data = data.data();
+        int const column = number(bits.width), row = number(bits.height), stride = 90 * Surface::kBytes + 1;
+        GrBitsBox const box{{actual.data(), stride, bits.width - column, bits.height - row}, bits, column,
+            row, static_cast<typename Surface::Pixel>(random()),
+            static_cast<typename Surface::Pixel>(random()), number(2) != 0};
+        for (int y = row; y < bits.height; ++y)
+            for (int x = column; x < bits.width; ++x)
+                if (bits.IsSet(y, x) || !box.transparent)
+                    Surface::WritePixel(expected.data() + (y - row) * stride, x - column,
+                        static_cast<typename Surface::Pixel>(bits.IsSet(y, x) ? box.fore : box.back));
+        GrWideBits<kLanes, Surface>::Paint(box);
+        ASSERT_EQ(actual, expected) << kLanes << " lanes of " << Surface::kBytes;
+    }
+}
+
 template <int kLanes>
 void JudgeFormats()
 {
@@ -77,6 +107,10 @@ void JudgeFormats()
     JudgeRows<kLanes, GrSurface24, GrColors24>();
     JudgeRows<kLanes, GrSurface32, GrColors24>();
     JudgeRows<kLanes, GrSurface32, GrColorsRGB>();
+    JudgeBits<kLanes, GrSurface8>();
+    JudgeBits<kLanes, GrSurface16>();
+    JudgeBits<kLanes, GrSurface24>();
+    JudgeBits<kLanes, GrSurface32>();
 }
 
 // The same pixels as one by one.

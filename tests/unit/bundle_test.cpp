@@ -100,6 +100,7 @@ TEST(Bundle, FilesOutliveTheirModuleAndAreReadOnManyThreads)
 TEST(Bundle, DamageIsToldAndNeverDelivered)
 {
     BundleApi::SetLanguage("de");
+    std::u16string message;
     for (std::size_t place = 0; place < archive.size(); place += 7) {
         std::string bytes = archive;
         bytes[place] ^= 0x10;
@@ -113,7 +114,13 @@ TEST(Bundle, DamageIsToldAndNeverDelivered)
         std::unique_ptr<unsigned char[]> const chain(BundleApi::GetFileError(file, &size));
         Common::Error const error = Common::ParseErrorChain(chain.get(), size);
         ASSERT_EQ(error.info != nullptr, file != nullptr && text == "none");
-        EXPECT_TRUE(!error || error.info->ops->GetAscii(error.info, "archive") == module.path);
+        if (error) {
+            EXPECT_EQ(error.info->ops->GetAscii(error.info, "archive"), module.path);
+            error.info->ops->GetMessage(error.info, message);
+            EXPECT_EQ(message, u"Beim Lesen der Datei ist ein Fehler aufgetreten.");
+            error.info->reason->ops->GetMessage(error.info->reason, message);
+            EXPECT_NE(message, u"") << "what the unpacker says";
+        }
         BundleApi::CloseFile(file);
     }
     EXPECT_EQ(Module(Contents("/proc/self/exe")).handle, nullptr);

@@ -82,11 +82,11 @@ TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
              SLOT(ExcludeClipRegion), SLOT(ResetClipRegion), SLOT(GetClipRect), SLOT(SetOrigin),
              SLOT(GetOrigin), SLOT(SetBackColor), SLOT(SetForeColor), SLOT(SetPattern), SLOT(SetRasterMode),
              SLOT(GetRasterMode), SLOT(GetPixel), SLOT(DrawPixel), SLOT(FillRegion), SLOT(FillRegionAlpha),
-             SLOT(DrawLine), SLOT(DrawArc), SLOT(FillArc), SLOT(FillPolygon), SLOT(DrawBitmap),
-             SLOT(DrawBitmapTransparent), SLOT(DrawImageMasked), SLOT(DrawImage), SLOT(DrawImageAlpha),
-             SLOT(ReadImage), SLOT(DrawImageMaskedDirect), SLOT(DrawImageDirect), SLOT(DrawImageAlphaDirect),
-             SLOT(ReadImageDirect), SLOT(CopyFromContext), SLOT(LoadPixels), SLOT(LoadPixelsDithered),
-             SLOT(UnloadPixels), SLOT(SetBaseOrigin), SLOT(SetLimitRegion)})
+             SLOT(DrawLine), SLOT(DrawArc), SLOT(FillArc), SLOT(FillPolygon), SLOT(DrawText), SLOT(DrawTextW),
+             SLOT(DrawBitmap), SLOT(DrawBitmapTransparent), SLOT(DrawImageMasked), SLOT(DrawImage),
+             SLOT(DrawImageAlpha), SLOT(ReadImage), SLOT(DrawImageMaskedDirect), SLOT(DrawImageDirect),
+             SLOT(DrawImageAlphaDirect), SLOT(ReadImageDirect), SLOT(CopyFromContext), SLOT(LoadPixels),
+             SLOT(LoadPixelsDithered), SLOT(UnloadPixels), SLOT(SetBaseOrigin), SLOT(SetLimitRegion)})
         EXPECT_EQ(actual, slot++);
 #undef SLOT
 }

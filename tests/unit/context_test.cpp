@@ -1,5 +1,6 @@
 #include <support/canvas.h>
 #include <support/random_blits.h>
+#include <support/random_text.h>
 #include <support/seed.h>
 #include <support/shape_model.h>
 #include <tessella/pixel/fill_rows.h>
@@ -122,9 +123,11 @@ void Judge(GrContext& context, GrImage const* image, unsigned char const* pixels
     SCOPED_TRACE("seed " + std::to_string(seed));
     RandomDrawing drawing(context, canvas, seed);
     RandomBlits blits(context, image, canvas, ~seed);
+    RandomText text(context, canvas, seed + 1);
     for (int step = 0; step < 1500; ++step) {
         drawing.Step();
         if (step % 3 == 0) blits.Step();
+        if (step % 3 == 1) text.Step();
         ASSERT_FALSE(testing::Test::HasFailure()) << "step " << step;
         ASSERT_EQ(std::memcmp(pixels, canvas.memory.data(), canvas.memory.size()), 0) << "step " << step;
     }

@@ -1,0 +1,13 @@
+#include "pages.h"
+
+namespace gallery {
+
+std::span<Page const> Pages()
+{
+    static constexpr Page kPages[] = {{"fills", DrawFills}, {"raster-modes", DrawRasterModes},
+        {"lines", DrawLines}, {"polygons", DrawPolygons}, {"arcs", DrawArcs}, {"images", DrawImages},
+        {"dithering", DrawDithering}, {"alpha", DrawAlpha}, {"masks", DrawMasks}, {"cursors", DrawCursors}};
+    return kPages;
+}
+
+}

@@ -1,0 +1,11 @@
+#pragma once
+
+/// Makes the session's keyboard and takes the console's tty for it: raw keys, read on a thread of their own,
+/// graphics mode, and a say in console switches. What fails is left out, and the session goes on.
+void GrKeyboardCreate();
+
+/// Ends the thread, gives the tty back as it was and deletes the keyboard; `sessionKeyboard` stays set.
+void GrKeyboardDestroy();
+
+/// The tty that the session holds, -1 if none. For handlers of signals, too.
+int ConsoleTty();

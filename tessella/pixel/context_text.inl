@@ -1,0 +1,153 @@
+#include <algorithm>
+#include <limits>
+#include <span>
+
+inline GrBits BitsOf(GrGlyphInfo const& glyph)
+{
+    return {glyph.bits, static_cast<int>(glyph.width), static_cast<int>(glyph.rows),
+        static_cast<int>(glyph.pitch), true};
+}
+
+/// The levels of a grey glyph as an image of alpha values. They stay the font's.
+struct GrGlyphImage : GrImage {
+    explicit GrGlyphImage(GrGlyphInfo const& glyph)
+        : GrImage(static_cast<int>(glyph.width), static_cast<int>(glyph.rows), nullptr,
+              const_cast<unsigned char*>(glyph.bits), GrImageHasAlpha)
+    {}
+    ~GrGlyphImage() { Detach(); }
+};
+
+/// The back colour in the cells of an opaque text, where no glyph's box is. As long as boxes follow each other
+/// without meeting, and no box reaches beyond the pen behind it, three rectangles beside each are all. Others
+/// are cut out of a region of gaps, until the pen has passed them all.
+template <typename S>
+class GrGenericContextBase<S>::TextBack {
+public:
+    TextBack(GrGenericContextBase& drawnContext, int pen, int cellTop, int cellBottom, bool isBold)
+        : context(drawnContext), top(cellTop), bottom(cellBottom), painted(pen), reach(pen), bold(isBold)
+    {}
+
+    /// The glyph in `box` has been drawn, and the pen is behind it now.
+    void Pass(GrRect const& box, int pen)
+    {
+        if (box.IsEmpty()) return;
+        // What makes a glyph bold may leave pixels of its box alone, or hit the gaps of others: then the gaps
+        // come last.
+        if (!hasGaps && !bold && box.x1 >= painted && box.x2 <= pen) {
+            Fill({painted, top, box.x1, bottom});
+            Fill({box.x1, top, box.x2, std::min(box.y1, bottom)});
+            Fill({box.x1, std::max(box.y2, top), box.x2, bottom});
+            painted = reach = box.x2;
+            return;
+        }
+        if (!hasGaps) CutRegion(gaps.Get(), context.clip, GrRect{painted, top, kFarRight, bottom});
+        hasGaps = true;
+        gaps.Get() -= box;
+        reach = std::max(reach, box.x2);
+        if (!bold && reach <= pen) FillGaps(reach);
+    }
+
+    /// What lies behind the last pen stays as it is.
+    void End(int pen)
+    {
+        if (hasGaps)
+            FillGaps(pen);
+        else
+            Fill({painted, top, pen, bottom});
+    }
+
+private:
+    static constexpr int kFarRight = std::numeric_limits<int>::max();
+
+    void Fill(GrRect const& rect)
+    {
+        if (rect.IsEmpty()) return;
+        context.WalkClip(
+            rect, 0, 0, [&](GrRange columns, GrRange rows, int, int) { FillRange(columns, rows); });
+    }
+
+    void FillGaps(int end)
+    {
+        LocalRegion const cut;
+        GrRegion const& region = cut.Get();
+        CutRegion(cut.Get(), gaps.Get(), GrRect{painted, top, end, bottom});
+        painted = end;
+        hasGaps = false;
+        if (!region) return;
+        typename S::WalkGuard const guard(context, region);
+        if (!context.HasPixels()) return;
+        for (auto const& band : BandsOf(region))
+            for (auto const& range : RangesOf(band))
+                FillRange(range, {band.r1, band.r2});
+    }
+
+    void FillRange(GrRange const& columns, GrRange const& rows)
+    {
+        context.FillRows({context.PixelAddress(context.RowAddress(rows.r1), columns.r1), context.Stride(),
+                             columns.r2 - columns.r1, rows.r2 - rows.r1},
+            context.backColor);
+    }
+
+    GrGenericContextBase& context;
+    int const top, bottom;  ///< of the cells
+    int painted;            ///< all of the cells left of here is, but for the gaps
+    int reach;              ///< the right edge of the boxes so far
+    bool const bold;
+    bool hasGaps = false;
+    LocalRegion const gaps;  ///< from `painted` on
+};
+
+template <typename S>
+template <typename Character>
+void GrGenericContextBase<S>::DrawCharacters(
+    int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent)
+{
+    if (!font.IsValid()) return;
+    bool const bold = static_cast<GrFontBase&>(font).embolden;
+    int pen = Moved(x, this->originX);
+    int const baseline = Moved(y, this->originY);
+    int const top = SeenFrom(baseline, static_cast<int>(font.GetAscent()));
+
+    typename S::TextGuard const guard(*this);
+    TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), bold);
+    GrGlyphInfo glyph;
+    unsigned previous = 0;
+    for (unsigned const code : std::span(text, length)) {
+        if (font.GetGlyph(code, glyph)) {
+            int const left = Moved(pen, glyph.left), glyphTop = SeenFrom(baseline, glyph.top);
+            GrRect box{left, glyphTop, Moved(left, static_cast<int>(glyph.width)),
+                Moved(glyphTop, static_cast<int>(glyph.rows))};
+            pen = Moved(pen, static_cast<int>(glyph.advance) + bold);
+            int shift[2];
+            if (previous != 0 && font.GetKerning(shift, code, previous)) box = Moved(box, shift[0], shift[1]);
+            StrikeGlyph(box, glyph, transparent);
+            if (bold) Embolden(box, glyph, transparent);
+            if (!transparent) back.Pass({box.x1, box.y1, Moved(box.x2, bold), box.y2}, pen);
+        }
+        previous = code;
+    }
+    if (!transparent) back.End(pen);
+}
+
+template <typename S>
+inline void GrGenericContextBase<S>::StrikeGlyph(
+    GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
+{
+    if (glyph.bitsPerPixel == 1) return DrawBits(box.x1, box.y1, BitsOf(glyph), transparent);
+    GrGlyphImage const image(glyph);
+    this->DrawImageAlpha(InContext(box), &image, 0, 0, {transparent, false, false, 0});
+}
+
+template <typename S>
+void GrGenericContextBase<S>::Embolden(GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
+{
+    if (!transparent) {
+        // The column of a grey glyph stands where its context coordinates say on the surface.
+        GrRect const beside = glyph.bitsPerPixel == 1 ? box : InContext(box);
+        WalkClip({beside.x2, beside.y1, Moved(beside.x2, 1), beside.y2}, 0, 0,
+            [&](GrRange columns, GrRange rows, int, int) {
+                this->PatternColumn(columns.r1, rows.r1, rows.r2 - rows.r1, this->backColor, this->backColor);
+            });
+    }
+    StrikeGlyph(Moved(box, 1, 0), glyph, true);
+}

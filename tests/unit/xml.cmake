@@ -1,0 +1,1 @@
+tessella_test(NAME xml_test LABEL unit SOURCES xml_test.cpp)

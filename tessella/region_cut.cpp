@@ -40,8 +40,8 @@ class Output {
 public:
     explicit Output(GrItemArray<Band>& bands) : list(bands) { list.item_count = 0; }
 
-    /// Appends the rows `r1` to `r2`, if there are any, with what `band` and `other` share; rows that show the
-    /// same as those above them only make that band longer.
+    /// Appends the rows `r1` to `r2`, if there are any, with what `band` and `other` share; rows that show
+    /// the same as those above them only make that band longer.
     void Append(int r1, int r2, Band const& band, Band const& other)
     {
         if (r1 >= r2) return;

@@ -68,8 +68,8 @@ public:
     /// Writes the image as a stream like that of `Load`, without the alpha plane. All pixels but the last
     /// write 8 bytes from their place on, red, green, blue, the colour's alpha and zeros, which the next ones
     /// overwrite in part; the last writes 3. With a `step` of 3, the buffer needs room for 2 bytes behind the
-    /// stream, with one below 3 for 8 - 2 * `step`, and with a `step` of 4 or more for none. Below 3, only the
-    /// first `step` bytes of a pixel remain; above 8, the bytes between are not touched. An image without
+    /// stream, with one below 3 for 8 - 2 * `step`, and with a `step` of 4 or more for none. Below 3, only
+    /// the first `step` bytes of a pixel remain; above 8, the bytes between are not touched. An image without
     /// pixels writes nothing.
     void Unload(unsigned char* data, unsigned step);
 

@@ -24,8 +24,8 @@ inline bool IsOneRectangle(GrRegion const& region)
     return region.bands.item_count == 1 && region.bands.items[0].item_count == 1;
 }
 
-/// The rows from the first band to the last one. Bands can overlap, so any of them may be the one that reaches
-/// farthest. A region without bands has none.
+/// The rows from the first band to the last one. Bands can overlap, so any of them may be the one that
+/// reaches farthest. A region without bands has none.
 inline GrRange RowsOf(GrRegion const& region)
 {
     GrRange rows{std::numeric_limits<int>::max(), std::numeric_limits<int>::min()};

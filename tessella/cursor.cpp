@@ -53,7 +53,9 @@ void GrCursor::Retire()
 
 void GrCursor::Activate()
 {
-    if (saveImage->bytes != static_cast<int>(GrScreen.bytesPerPixel)) return;
+    if (saveImage->bytes != static_cast<int>(GrScreen.bytesPerPixel) ||
+        saveImage->bits != static_cast<int>(GrScreen.depth))
+        return;
     std::scoped_lock const lock(screenMutex);
     GrCursor* const before = currentCursor;
     if (before == this) return;
@@ -64,7 +66,7 @@ void GrCursor::Activate()
     currentCursor = this;
     x = atX;
     y = atY;
-    if (first) Show();
+    if (first) GrShowCursor();  // not only drawn, but known to be: a change of mode has hidden the one before
     hideCount.fetch_sub(1, std::memory_order_relaxed);
 }
 

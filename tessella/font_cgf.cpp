@@ -15,11 +15,11 @@ constexpr std::uint8_t kBuiltInFont = 1;
 constexpr std::uint8_t kItalic = 8;
 
 unsigned shareCount = 0;
-std::unique_ptr<CGF_Container> container;  // while there are shares
+std::unique_ptr<CGF_Container> shared;  // while there are shares
 
 }
 
-void ReadContainer(si_file& file, CGF_Container& to)
+void ReadContainer(si_file& file, CGF_Container& container)
 {
     unsigned char head[sizeof(CGF_Header)] = {};
     std::uint64_t headCount = 0;
@@ -36,7 +36,7 @@ void ReadContainer(si_file& file, CGF_Container& to)
         file.Read(bytes.get() + sizeof head, size - sizeof head, restCount);
     }
     GR_ASSERT_LINE(restCount + sizeof head == header.size, "rs==(h.size-sz)", 52);
-    if (bytes) to.Parse({bytes.get(), headCount + restCount});
+    if (bytes) container.Parse({bytes.get(), headCount + restCount});
 }
 
 GrFontCGFDevice::Share::Share()
@@ -45,23 +45,23 @@ GrFontCGFDevice::Share::Share()
         auto loaded = std::make_unique<CGF_Container>();
         std::unique_ptr<si_file> const file(ZipOpen("glyphset.cgf"));
         if (GR_ASSERT_LINE(file != nullptr, "file != 0", 42)) ReadContainer(*file, *loaded);
-        container = std::move(loaded);
+        shared = std::move(loaded);
     }
     ++shareCount;
 }
 
 GrFontCGFDevice::Share::~Share()
 {
-    if (--shareCount == 0) container.reset();
+    if (--shareCount == 0) shared.reset();
 }
 
 GrFontCGFDevice::GrFontCGFDevice(GrFontDesc const& desc) : GrFontBase(desc.flags.smooth, desc.weight)
 {
-    font = container->FindFontById(kBuiltInFont);
+    font = shared->FindFontById(kBuiltInFont);
     if (!font) return;
     CGF_Container::Key const key{desc.flags.italic ? kItalic : std::uint8_t{0},
         static_cast<std::uint16_t>(desc.flags.italic ? 0 : desc.weight)};
-    if (auto const* const matching = container->FindFont(key)) font = matching;
+    if (auto const* const matching = shared->FindFont(key)) font = matching;
     height = font->height;
     weight = font->weight;
     ascent = font->ascent;

@@ -38,6 +38,6 @@ public:
     using GrFontSubclass::GrFontSubclass;
 };
 
-/// Has the container take what the file holds. A file that ends early is reported and taken as far as it goes;
-/// one that is no such file leaves the container empty.
+/// Has the container take what the file holds. A file that ends early is reported and taken as far as it
+/// goes; one that is no such file leaves the container empty.
 void ReadContainer(si_file& file, CGF_Container& container);

@@ -24,8 +24,8 @@ public:
     explicit GrScreenGuard(GrRect const& rect);
     ~GrScreenGuard();
 
-    /// Guards these pixels, too: as a guard within this one would, but without waiting for what was drawn last,
-    /// as every step of the counter does.
+    /// Guards these pixels, too: as a guard within this one would, but without waiting for what was drawn
+    /// last, as every step of the counter does.
     void Extend(GrRegion const& region) const;
     void Extend(GrRect const& rect) const;
 

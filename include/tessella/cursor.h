@@ -31,8 +31,9 @@ public:
     /// there.
     virtual ~GrCursor();
 
-    /// Makes the cursor the current one, where the one before stood or in the middle of the screen. Nothing
-    /// happens if it was made in another mode.
+    /// Makes the cursor the current one, where the one before stood, or without one in the middle of the
+    /// screen, until the pointer moves or something is drawn: so activate a new one before deleting the old.
+    /// Nothing happens if it was made in another mode.
     virtual void Activate();
 
     /// Draws the part of the shape from its pixel `sx`, `sy` on to the rectangle `where` of a surface, in

@@ -42,18 +42,19 @@ struct GrBitsBox {
 };
 
 /// Takes many bits at a time, wherever they begin, and touches no byte that holds none. The picture has
-/// pixels.
+/// pixels. Always inlined, since sources for several generations of processors use it.
 class GrBitsReader {
 public:
-    explicit GrBitsReader(GrBits const& bits)
-        : pitch(static_cast<std::size_t>(bits.pitch == 0 ? bits.width : bits.pitch * 8)), data(bits.data),
-          isReversed(bits.pitch != 0 && bits.msbFirst)
+    [[gnu::always_inline]] explicit GrBitsReader(GrBits const& bits)
+        : pitch(bits.pitch == 0 ? static_cast<std::size_t>(bits.width)
+                                : static_cast<std::size_t>(bits.pitch) * 8),
+          data(bits.data), isReversed(bits.pitch != 0 && bits.msbFirst)
     {
         std::size_t const size =
             (static_cast<unsigned>(bits.height - 1) * pitch + static_cast<unsigned>(bits.width) + 7) / 8;
         lastWord = size - kWord;
         if (size >= kWord) return;
-        std::copy_n(data, size, few);
+        std::memcpy(few, data, size);
         data = few;
         lastWord = 0;
     }
@@ -62,7 +63,7 @@ public:
 
     /// The pixels from bit `first` on, in the order of the picture, the first in the lowest bit: `kMost`, or
     /// all that there are. What comes behind them means nothing.
-    std::uint64_t Read(std::size_t first) const
+    [[gnu::always_inline]] std::uint64_t Read(std::size_t first) const
     {
         std::size_t const byte = std::min(first / 8, lastWord);
         std::uint64_t word;
@@ -78,7 +79,7 @@ private:
     static constexpr std::size_t kWord = sizeof(std::uint64_t);
 
     /// The bits of each byte in opposite order.
-    static constexpr std::uint64_t WithBytesReversed(std::uint64_t word)
+    [[gnu::always_inline]] static constexpr std::uint64_t WithBytesReversed(std::uint64_t word)
     {
         word = (word >> 4 & 0x0F0F0F0F0F0F0F0F) | (word & 0x0F0F0F0F0F0F0F0F) << 4;
         word = (word >> 2 & 0x3333333333333333) | (word & 0x3333333333333333) << 2;

@@ -17,9 +17,9 @@ struct GrGlyphImage : GrImage {
     ~GrGlyphImage() { Detach(); }
 };
 
-/// The back colour in the cells of an opaque text, where no glyph's box is. As long as boxes follow each other
-/// without meeting, and no box reaches beyond the pen behind it, three rectangles beside each are all. Others
-/// are cut out of a region of gaps, until the pen has passed them all.
+/// The back colour in the cells of an opaque text, where no glyph's box is. As long as boxes follow each
+/// other without meeting, and no box reaches beyond the pen behind it, three rectangles beside each are all.
+/// Others are cut out of a region of gaps, until the pen has passed them all.
 template <typename S>
 class GrGenericContextBase<S>::TextBack {
 public:
@@ -130,8 +130,7 @@ void GrGenericContextBase<S>::DrawCharacters(
 }
 
 template <typename S>
-inline void GrGenericContextBase<S>::StrikeGlyph(
-    GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
+void GrGenericContextBase<S>::StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent)
 {
     if (glyph.bitsPerPixel == 1) return DrawBits(box.x1, box.y1, BitsOf(glyph), transparent);
     GrGlyphImage const image(glyph);

@@ -101,7 +101,7 @@ private:
     template <typename Character>
     void DrawCharacters(int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent);
     /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; and once more, a pixel beside it.
-    [[gnu::always_inline]] void StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
+    void StrikeGlyph(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
     void Embolden(GrRect const& box, GrGlyphInfo const& glyph, bool transparent);
 };
 

@@ -15,7 +15,8 @@
 
 // Several pixels at a time, in vectors of one word a pixel, as wide as the processor's registers. Sources
 // that include this are compiled for one generation of processors each; everything here is inlined, or
-// depends on the number of lanes, so that they share no code.
+// depends on the number of lanes, so that they share no code. What is taken for narrow rows, with fewer lanes
+// than a source is there for, is inlined.
 
 #define GR_INLINE [[gnu::always_inline]] inline
 #define GR_INLINE_LAMBDA __attribute__((always_inline))
@@ -75,8 +76,8 @@ struct GrWide : GrWideVectors<kLaneCount> {
     /// The word's halves exchanged.
     GR_INLINE static Words Turned(Words const& words) { return words << 16 | words >> 16; }
 
-    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is all
-    /// that is needed.
+    /// Factors of pixels, below 256, for each of their halves; at its top, where a product's upper half is
+    /// all that is needed.
     GR_INLINE static Halves Factors(Words const& factors)
     {
         Words const upper = factors << 8;
@@ -199,7 +200,7 @@ struct GrWide : GrWideVectors<kLaneCount> {
 
     /// Where the lanes begin that contain column `next`, out of `from` to `to`. The last ones go back over
     /// some columns that are done already, unless there are fewer columns than lanes in all.
-    static constexpr int Start(int next, int from, int to)
+    GR_INLINE static constexpr int Start(int next, int from, int to)
     {
         return to - next < kLanes && to - from >= kLanes ? to - kLanes : next;
     }

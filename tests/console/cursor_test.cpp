@@ -87,6 +87,17 @@ public:
         ASSERT_EQ(std::pair(x, y), std::pair(pointerX, pointerY));
     }
 
+    /// The session goes on in the same mode, with the pointer in the middle and no cursor.
+    void ChangeMode()
+    {
+        Sizes sizes;
+        ASSERT_TRUE(GrChangeMode(sizes.width, sizes.height, sizes.depth, 0));
+        pointerX = kWidth / 2;
+        pointerY = kHeight / 2;
+        cursor.reset();
+        Compare();
+    }
+
     void Compare()
     {
         std::size_t const row = kWidth * GrScreen.bytesPerPixel;
@@ -166,13 +177,29 @@ TEST(Cursor, StandsOnThePictureWhateverIsPaintedAndWhereverItGoes)
         for (int step = 0; step < 600 && !testing::Test::HasFailure(); ++step) {
             if (step % 60 == 0)
                 desk.Activate({1 + desk.Pick(24), desk.Pick(20), desk.Pick(20), desk.Pick(2) == 0});
-            if (step % 60 == 50) desk.Deactivate();
+            if (step % 120 == 50) desk.Deactivate();  // every other one is followed by the next
             int const reach = desk.Pick(4) == 0 ? 60 : 9;
             if (desk.Pick(3) == 0)
                 desk.FillSomewhere();
             else
                 desk.Move(desk.Pick(2 * reach) - reach, desk.Pick(2 * reach) - reach);
             desk.AwaitPointer();
+            desk.Compare();
+        }
+    });
+}
+
+TEST(Cursor, ComesBackAfterAChangeOfMode)
+{
+    RunInEachMode([](Desk& desk, console::VirtualConsole&) {
+        desk.Activate({10, 2, 3, true});
+        desk.Move(9, 9);
+        desk.AwaitPointer();
+        desk.ChangeMode();
+        desk.Activate({10, 5, 5, true});
+        desk.Compare();
+        for (int i = 0; i < 40; ++i) {
+            desk.FillSomewhere();
             desk.Compare();
         }
     });

@@ -185,16 +185,14 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
     GrScreen.stride = 64;
     std::unique_ptr<GrContext> const context(
         FindVideoMode(32, 24)->createScreenContext(GrRect{0, 0, 16, 16}, 0, 0));
+    static constexpr GrRect kInside{2, 2, 4, 4};
     struct Case {
         bool waits;
         void (*draw)(GrContext& c);
     };
     hideCount = 0;
-    for (auto const& test : {Case{true, [](auto& c) { c.FillRegion(GrRegion()); }},
-             Case{true,
-                 [](auto& c) {
-                     c.FillRegion(GrRect{2, 2, 4, 4});
-                 }},
+    for (Case const& test : {Case{true, [](auto& c) { c.FillRegion(GrRegion()); }},
+             Case{true, [](auto& c) { c.FillRegion(kInside); }},
              Case{true, [](auto& c) { c.DrawLine(1, 1, 1, 5); }},
              Case{false, [](auto& c) { c.DrawLine(16, 1, 20, 5); }},
              Case{false, [](auto& c) { c.DrawArc(9, 9, 20, 20, 0, 5760); }},
@@ -203,17 +201,9 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
              Case{true, [](auto& c) { c.FillArc(0, -8, 20, 20, 5760, 2000); }},
              Case{true, [](auto& c) { c.DrawPixel(1, 1); }}, Case{false, [](auto& c) { c.DrawPixel(16, 1); }},
              Case{true, [](auto& c) { c.GetPixel(1, 1); }}, Case{false, [](auto& c) { c.GetPixel(1, -1); }},
-             Case{true,
-                 [](auto& c) {
-                     c.FillRegionAlpha(GrRect{1, 1, 2, 2}, 9);
-                 }},
-             Case{true,
-                 [](auto& c) {
-                     c.CopyFromContext(GrRect{0, 0, 1, 1}, &c, 0, 0);
-                 }},
-             Case{false, [](auto& c) {
-                      c.DrawImageAlphaDirect(GrRect{0, 0, 1, 1}, nullptr, 0, 0, {});
-                  }}}) {
+             Case{true, [](auto& c) { c.FillRegionAlpha(kInside, 9); }},
+             Case{true, [](auto& c) { c.CopyFromContext(kInside, &c, 0, 0); }},
+             Case{false, [](auto& c) { c.DrawImageAlphaDirect(kInside, nullptr, 0, 0, {}); }}}) {
         screenMutex.lock();
         auto const drawn = std::async(std::launch::async, [&] { test.draw(*context); });
         if (test.waits)

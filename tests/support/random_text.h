@@ -3,6 +3,8 @@
 #include <support/canvas.h>
 #include <tessella/font.h>
 
+#include <gtest/gtest.h>
+
 #include <random>
 #include <set>
 #include <utility>

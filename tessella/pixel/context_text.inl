@@ -68,8 +68,9 @@ private:
 
     void FillGaps(int end)
     {
-        GrRegion& region = gaps.Get();
-        region -= GrRect{end, top, kFarRight, bottom};
+        LocalRegion const cut;
+        GrRegion const& region = cut.Get();
+        CutRegion(cut.Get(), gaps.Get(), GrRect{painted, top, end, bottom});
         painted = end;
         hasGaps = false;
         if (!region) return;

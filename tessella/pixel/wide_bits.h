@@ -3,6 +3,8 @@
 #include <tessella/pixel/bits.h>
 #include <tessella/pixel/wide_format.h>
 
+namespace wide {
+
 /// Paints the first columns of a box, as many as there are lanes. Those beyond its right edge are masked out
 /// like clear bits, so that narrow boxes cost no more than one store a row. Several of their rows are read at
 /// once.
@@ -53,4 +55,6 @@ GR_INLINE void PaintBitsOf(GrBitsBox const& given)
             PaintBitsWide<W, Surface, false>(box, reader, first);
         box.target.address += std::ptrdiff_t{W::kLanes} * Surface::kBytes;
     }
+}
+
 }

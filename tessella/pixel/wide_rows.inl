@@ -37,9 +37,9 @@ template <int kLanes, GrSurfacePolicy Surface>
 void GrWideBits<kLanes, Surface>::Paint(GrBitsBox const& box)
 {
     if (kLanes == 16 && box.target.width <= 8)
-        PaintBitsOf<GrWide<8>, Surface>(box);
+        wide::PaintBitsOf<GrWide<8>, Surface>(box);
     else
-        PaintBitsOf<GrWide<kLanes>, Surface>(box);
+        wide::PaintBitsOf<GrWide<kLanes>, Surface>(box);
 }
 
 template struct GrWideBits<kLanesHere, GrSurface8>;

@@ -1,4 +1,5 @@
 #include <support/on_console.h>
+#include <support/seed.h>
 #include <support/window_judge.h>
 #include <tessella.h>
 #include <tessella/window_state.h>
@@ -299,8 +300,7 @@ void PaintNow(GrEvent const& event) { painter->PaintAsTold(event); }
 TEST(Windows, RandomTreesAreAsTheJudgeSays)
 {
     char const* const steps = std::getenv("TESSELLA_SOAK");
-    unsigned const seed = steps ? std::random_device()() : 20261121;
-    RecordProperty("seed", std::to_string(seed));
+    unsigned const seed = steps ? NewSeed() : 20261121;
     auto const outcome = OnConsole("44x36x32", nullptr, [&](console::VirtualConsole& screen) {
         SCOPED_TRACE(testing::Message() << "seed " << seed);
         Sizes sizes;

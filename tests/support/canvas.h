@@ -71,7 +71,8 @@ public:
             clip[i] = limit[i] && region.Contains(x - originX, y - originY);
         });
     }
-    void ExcludeClip(GrRegion const& region)
+    void ExcludeClipRect(GrRect const& rect) { ExcludeClipRegion(rect); }
+    void ExcludeClipRegion(GrRegion const& region)
     {
         ForEachPixel([&](int x, int y, std::size_t i) {
             if (region.Contains(x - originX, y - originY)) clip[i] = false;

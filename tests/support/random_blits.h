@@ -3,6 +3,7 @@
 #include <support/canvas.h>
 #include <tessella/bitmap.h>
 #include <tessella/image.h>
+#include <tessella/pixel/clip_walk.h>
 #include <tessella/pixel/colors.h>
 #include <tessella/pixel/surface.h>
 
@@ -19,7 +20,7 @@ struct ImageKind : Canvas::Format {
 inline ImageKind const kImageKinds[] = {{Canvas::FormatOf<GrSurface8, GrColors4>()},
     {Canvas::FormatOf<GrSurface8, GrColors8>()}, {Canvas::FormatOf<GrSurface16, GrColors15>()},
     {Canvas::FormatOf<GrSurface16, GrColors16>()}, {Canvas::FormatOf<GrSurface24, GrColors24>()},
-    {Canvas::FormatOf<GrSurface32, GrColors24>(32)},
+    {Canvas::FormatOf<GrSurface32, GrColors24>()},
     {Canvas::FormatOf<GrSurface32, GrColorsRGB>(), GrImageTrueColor},
     {Canvas::FormatOf<GrSurface32, GrColorsRGBA>(), GrImageTrueColor | GrImagePremultiplied}};
 
@@ -42,17 +43,17 @@ public:
         direct = false;
         switch (Number(0, 7)) {
         case 0: return DrawBitmap();
-        case 1: return CopyOwnFormat();
+        case 1: return CopyOwn();
         case 2: return drawn ? Stream() : void();
-        case 3: return CopyForeign();
-        case 4: return CopyOntoItself();
-        case 5: return ReadForeign();
+        case 3:
+        case 4: return CopyConverted();
+        case 5: return Read();
         default: return Blend();
         }
     }
 
 private:
-    static constexpr int kWidth = 90, kHeight = 60;  // of images; enough for every rectangle
+    static constexpr int kWidth = 90, kHeight = 60, kArea = kWidth * kHeight;  // enough for every rectangle
     using Bytes = std::vector<unsigned char>;
 
     int Number(int from, int to) { return std::uniform_int_distribution(from, to)(random); }
@@ -66,30 +67,40 @@ private:
         rect = {x, y, std::min(rect.x2 - rect.x1 + x, canvas.width),
             std::min(rect.y2 - rect.y1 + y, canvas.height)};
     }
-    unsigned char* NewBytes(int size)
+    Bytes NewBytes(int size)
     {
-        auto* const bytes = new unsigned char[static_cast<std::size_t>(size)];
-        std::generate_n(bytes, size, [&] { return static_cast<unsigned char>(random()); });
+        Bytes bytes(static_cast<std::size_t>(size));
+        std::generate(bytes.begin(), bytes.end(), [&] { return static_cast<unsigned char>(random()); });
         return bytes;
+    }
+    /// Like an icon's: runs of 0 and 255 between others.
+    Bytes NewAlphas(int size)
+    {
+        Bytes alphas = NewBytes(size);
+        int run = 0;
+        for (unsigned char& alpha : alphas) {
+            if (Number(0, 20) == 0) run = Number(0, 2);
+            if (run != 0) alpha = run == 1 ? 0 : 255;
+        }
+        return alphas;
+    }
+    static unsigned char* Owned(Bytes const& bytes)
+    {
+        return std::copy(bytes.begin(), bytes.end(), new unsigned char[bytes.size()]) - bytes.size();
     }
     std::unique_ptr<GrBitmap> NewBitmap(int width, int height)
     {
         auto bitmap = std::make_unique<GrBitmap>(width, height);
-        bitmap->Load(std::unique_ptr<unsigned char[]>(NewBytes((width + 7) / 8 * height)).get());
+        bitmap->Load(NewBytes((width + 7) / 8 * height).data());
         return bitmap;
     }
     std::unique_ptr<GrImage> NewImage(Canvas::Format const& kind, std::uint32_t flags)
     {
         auto image = std::make_unique<GrImage>(kWidth, kHeight,
-            flags & GrImageAlphaOnly ? nullptr : NewBytes(kWidth * kHeight * kind.bytes),
-            flags & GrImageHasAlpha ? NewBytes(kWidth * kHeight) : nullptr, flags);
+            flags & GrImageAlphaOnly ? nullptr : Owned(NewBytes(kArea * kind.bytes)),
+            flags & GrImageHasAlpha ? Owned(NewAlphas(kArea)) : nullptr, flags);
         image->bits = kind.bits;
         image->bytes = kind.bytes;
-        // Like an icon's: runs of 0 and 255 between others.
-        for (int i = 0, run = 0; image->alphaPlane && i < kWidth * kHeight; ++i) {
-            if (Number(0, 20) == 0) run = Number(0, 2);
-            if (run != 0) image->alphaPlane[i] = run == 1 ? 0 : 255;
-        }
         return image;
     }
     static bool Bit(GrBitmap const& bitmap, int x, int y)
@@ -114,14 +125,12 @@ private:
             context.GetClipRegion(local);
             local &= rect;
         }
-        for (int i = 0; i < local.bands.item_count; ++i)
-            for (int j = 0; j < local.bands.items[i].item_count; ++j) {
-                auto const& band = local.bands.items[i];
+        for (auto const& band : BandsOf(local))
+            for (auto const& [left, right] : RangesOf(band))
                 for (int y = band.r1; y < band.r2; ++y)
-                    for (int x = band.items[j].r1; x < band.items[j].r2; ++x)
+                    for (int x = left; x < right; ++x)
                         visit(x + x0, y + y0, sx + x - rect.x1, sy + y - rect.y1,
-                            GrRect{band.items[j].r1 + x0, band.r1 + y0, band.items[j].r2 + x0, band.r2 + y0});
-            }
+                            GrRect{left + x0, band.r1 + y0, right + x0, band.r2 + y0});
     }
 
     void DrawBitmap()
@@ -139,11 +148,11 @@ private:
             rect.x1, rect.y1, *bitmap);
     }
 
-    /// Perhaps through a mask, then back into another image.
-    void CopyOwnFormat()
+    /// Perhaps through a mask.
+    void CopyOwn()
     {
         MayBeDirect();
-        auto const source = NewImage(format, 0), read = NewImage(format, 0), expected = NewImage(format, 0);
+        auto const source = NewImage(format, 0);
         auto const mask = NewBitmap(kWidth, kHeight);
         bool const masked = Chance();
         Walk([&](int x, int y, int u, int v, auto) {
@@ -155,121 +164,122 @@ private:
         else
             (context.*(direct ? &GrContext::DrawImageDirect : &GrContext::DrawImage))(rect, *source, sx, sy);
         context.DrawImageMasked(rect, *source, *NewBitmap(kWidth, kHeight + 1), sx, sy);
-
-        auto const bytes = static_cast<unsigned>(format.bytes), size = kWidth * kHeight * bytes;
-        std::memcpy(expected->pixels, read->pixels, size);
-        Walk([&](int x, int y, int u, int v, auto) {
-            std::uint32_t const pixel = canvas.Read(x, y);
-            std::memcpy(expected->pixels + (v * kWidth + u) * format.bytes, &pixel, bytes);
-        });
-        (context.*(direct ? &GrContext::ReadImageDirect : &GrContext::ReadImage))(rect, *read, sx, sy);
-        EXPECT_EQ(std::memcmp(read->pixels, expected->pixels, size), 0);
     }
 
-    /// From a context with a clip and an origin of its own, or from an image as a whole; not only where it
-    /// has pixels.
-    void CopyForeign()
+    /// From an image, the context itself, or another one over the same pixels; not only where they have any.
+    void CopyConverted()
     {
         ImageKind const& kind = kImageKinds[Number(0, 7)];
         auto const image = NewImage(kind, kind.flags);
-        std::unique_ptr<GrContext> const source(image->GetContext());
-        bool const asImage = (kind.bits != format.bits || kind.bytes != format.bytes) && Chance();
-        sx -= 40;
-        sy -= 40;
-        if (!asImage) {
-            source->SetOrigin(Number(-9, 9), 4);
-            source->SetClipRegion(GrRect{-5, -5, 70, 40});
-            source->ExcludeClipRect({Number(0, 40), 5, 50, 20});
+        enum { FromImage, FromItself, FromTwin };
+        int const from = Number(0, drawn ? 2 : 1);
+        bool const isForeign = kind.bits != format.bits || kind.bytes != format.bytes;
+        bool const asImage = from == FromImage && isForeign && Chance();
+        std::unique_ptr<GrContext> const other((from == FromTwin ? drawn : image.get())->GetContext());
+        GrContext& source = from == FromItself ? context : *other;
+        sx = from == FromImage ? sx - 40 : rect.x1 + Number(-3, 3);
+        sy = from == FromImage ? sy - 40 : rect.y1 + Number(-3, 3);
+        int x0 = from == FromItself ? canvas.originX : 0, y0 = from == FromItself ? canvas.originY : 0;
+        if (from != FromItself && !asImage) {
+            source.SetOrigin(x0 = Number(-9, 9), y0 = 4);
+            source.SetClipRegion(GrRect{-5, -5, 70, 40});
+            source.ExcludeClipRect({Number(0, 40), 5, 50, 20});
         }
+        GrRegion seen;
+        source.GetClipRegion(seen);
         Walk([&](int x, int y, int u, int v, auto) {
-            canvas.Write(x, y, format.toPixel(source->GetPixel(u, v)));
+            GrColor color = 0;
+            if (seen.Contains(u, v))
+                color = from == FromImage ? kind.fromPixel(Pixel(*image, u + x0, v + y0))
+                                          : format.fromPixel(canvas.Read(u + x0, v + y0));
+            canvas.Write(x, y, format.toPixel(color));
         });
         if (asImage)
             context.DrawImage(rect, *image, sx, sy);
         else
-            context.CopyFromContext(rect, source.get(), sx, sy);
+            context.CopyFromContext(rect, &source, sx, sy);
     }
 
-    void CopyOntoItself()
+    /// Outside the clip, an image of the own format is left alone, and others become black.
+    void Read()
     {
-        sx = rect.x1 + Number(-3, 3);
-        sy = rect.y1 + Number(-3, 3);
-        Walk([&](int x, int y, int u, int v, auto) {
-            canvas.Write(x, y, format.toPixel(canvas.GetPixel(u, v)));
-        });
-        context.CopyFromContext(rect, &context, sx, sy);
-    }
-
-    void ReadForeign()
-    {
+        MayBeDirect();
         ImageKind const& kind = kImageKinds[Number(0, 7)];
-        if (kind.bits == format.bits && kind.bytes == format.bytes) return;
-        auto const image = NewImage(kind, kind.flags);
-        context.ReadImage(rect, *image, sx, sy);
-        for (int y = rect.y1; y < rect.y2; ++y)
+        bool const isOwn = direct || (kind.bits == format.bits && kind.bytes == format.bytes);
+        auto const image = NewImage(isOwn ? format : kind, isOwn ? 0 : kind.flags);
+        auto const size = static_cast<std::size_t>(image->bytes);
+        Bytes expected(image->pixels, image->pixels + kArea * size);
+        auto const expect = [&](int u, int v, std::uint32_t pixel) {
+            std::memcpy(&expected.at(static_cast<std::size_t>(v * kWidth + u) * size), &pixel, size);
+        };
+        for (int y = rect.y1; !isOwn && y < rect.y2; ++y)
             for (int x = rect.x1; x < rect.x2; ++x)
-                EXPECT_EQ(
-                    Pixel(*image, sx + x - rect.x1, sy + y - rect.y1), kind.toPixel(canvas.GetPixel(x, y)));
+                expect(sx + x - rect.x1, sy + y - rect.y1, kind.toPixel(0));
+        Walk([&](int x, int y, int u, int v, auto) {
+            expect(u, v, isOwn ? canvas.Read(x, y) : kind.toPixel(format.fromPixel(canvas.Read(x, y))));
+        });
+        (context.*(direct ? &GrContext::ReadImageDirect : &GrContext::ReadImage))(rect, *image, sx, sy);
+        EXPECT_TRUE(std::equal(expected.begin(), expected.end(), image->pixels));
     }
 
-    /// Loads and unloads all pixels.
+    /// Loads all pixels, perhaps diffused by alpha values of their own, and unloads them.
     void Stream()
     {
-        bool const dithers = format.dithers && !(drawn->flags & GrImageNoDither);
-        int const step = Number(drawn->alphaPlane ? 4 : 3, 5), area = drawn->width * drawn->height;
-        std::unique_ptr<unsigned char[]> const stream(NewBytes(area * step)), got(NewBytes(area * step + 8));
-        Bytes alphas(drawn->alphaPlane, drawn->alphaPlane + (drawn->alphaPlane ? area : 0));
-        Bytes unloaded(got.get(), got.get() + area * step + 8);
+        auto& whole = static_cast<GrContextI&>(context);
+        bool const diffused = format.dithers && Chance();
+        bool const dithers = diffused || (format.dithers && !(drawn->flags & GrImageNoDither));
+        unsigned const step = static_cast<unsigned>(Number(drawn->alphaPlane ? 4 : 3, 11));
+        int const area = drawn->width * drawn->height, size = area * static_cast<int>(step);
+        Bytes const stream = NewBytes(size);
+        Bytes own = NewAlphas(area), got = NewBytes(size + 8), unloaded = got;
+        unsigned char* const plane = drawn->alphaPlane;
+        if (plane && !diffused) own.assign(plane, plane + area);
+        bool const hasAlphas = plane || diffused;
         Canvas::Errors errors(drawn->width);
-        for (int i = 0; i < area; ++i) {
-            int const x = i % drawn->width, y = i / drawn->width;
+        for (std::size_t i = 0; i < own.size(); ++i) {
+            int const x = static_cast<int>(i) % drawn->width, y = static_cast<int>(i) / drawn->width;
             if (x == 0) errors.StartRow();
-            unsigned char const* const from = stream.get() + i * step;
-            GrColor const color = GrMakeColor(from[0], from[1], from[2], alphas.empty() ? 0 : from[3]);
-            auto* const alpha = alphas.empty() ? nullptr : &alphas[static_cast<std::size_t>(i)];
+            unsigned char const* const from = &stream[i * step];
+            GrColor const color = GrMakeColor(from[0], from[1], from[2], hasAlphas ? from[3] : 0);
             if (!dithers) {
                 canvas.Write(x, y, format.toPixel(color));
-                if (alpha) *alpha = from[3];
-            } else if (!alpha || *alpha == 255) {
+                own[i] = from[3];
+            } else if (!hasAlphas || own[i] == 255) {
                 canvas.Write(x, y, errors.Diffuse(format, color, x));
             }
             std::uint64_t const back = format.fromPixel(canvas.Read(x, y));
-            std::memcpy(&unloaded[static_cast<std::size_t>(i * step)], &back, i == area - 1 ? 3 : 8);
+            std::memcpy(&unloaded[i * step], &back, i == own.size() - 1 ? 3 : 8);
         }
-        auto& whole = static_cast<GrContextI&>(context);
-        whole.LoadPixels(stream.get(), static_cast<unsigned>(step));
-        whole.UnloadPixels(got.get(), static_cast<unsigned>(step));
-        EXPECT_TRUE(std::equal(unloaded.begin(), unloaded.end(), got.get()));
-        EXPECT_TRUE(std::equal(alphas.begin(), alphas.end(), drawn->alphaPlane));
+        if (diffused)
+            whole.LoadPixelsDithered(stream.data(), own.data(), step);
+        else
+            whole.LoadPixels(stream.data(), step);
+        whole.UnloadPixels(got.data(), step);
+        EXPECT_EQ(got, unloaded);
+        EXPECT_TRUE(!plane || diffused || std::equal(own.begin(), own.end(), plane));
     }
 
     /// With and without an image, its pixels, its alpha plane; through all operations that blend.
     void Blend()
     {
-        constexpr std::uint32_t kAlpha = GrImageHasAlpha | GrImageTrueColor;
         static constexpr std::uint32_t kFlags[] = {
-            GrImageTrueColor, kAlpha, kAlpha | GrImagePremultiplied, kAlpha | GrImageAlphaOnly};
+            0, GrImageHasAlpha, GrImageHasAlpha | GrImagePremultiplied, GrImageHasAlpha | GrImageAlphaOnly};
         static constexpr std::uint8_t kAlphas[] = {0, 1, 40, 128, 254, 255};
-        std::uint32_t const flags =
-            kFlags[Number(0, 3)] | (Chance() ? GrImageNoDither : 0u) | (Chance() ? GrImageOverBack : 0u);
-        GrBlendParams params{
-            Chance(), Chance(), !(flags & GrImageHasAlpha) || Chance(), kAlphas[Number(0, 5)]};
+        std::uint32_t const flags = GrImageTrueColor | kFlags[Number(0, 3)] |
+            (Chance() ? GrImageNoDither : 0u) | (Chance() ? GrImageOverBack : 0u);
         MayBeDirect();
-        std::unique_ptr<GrImage> image;
-        if (direct || Chance()) image = NewImage(kImageKinds[6], flags);
-        bool const simply = !direct && Chance() && (!image || image->alphaPlane);
-        if (!image) params.uniformAlpha = true;
-        if (simply && !image) params.overDestination = params.dither = true;
+        auto const image = direct || Chance() ? NewImage(kImageKinds[6], flags) : nullptr;
+        bool const hasAlphas = image && image->alphaPlane,
+                   simply = !direct && (hasAlphas || !image) && Chance();
+        GrBlendParams params{Chance(), Chance(), !hasAlphas || Chance(), kAlphas[Number(0, 5)]};
         if (simply && image) params = {!(flags & GrImageOverBack), !(flags & GrImageNoDither), false, 0};
+        if (simply && !image) params.overDestination = params.dither = true;
         JudgeBlend(image.get(), params);
-        if (direct)
-            context.DrawImageAlphaDirect(rect, image.get(), sx, sy, params);
-        else if (!simply)
-            context.DrawImageAlpha(rect, image.get(), sx, sy, params);
-        else if (image)
-            context.DrawImage(rect, *image, sx, sy);
+        if (simply)
+            image ? context.DrawImage(rect, *image, sx, sy) : context.FillRegionAlpha(rect, params.alpha);
         else
-            context.FillRegionAlpha(rect, params.alpha);
+            (context.*(direct ? &GrContext::DrawImageAlphaDirect : &GrContext::DrawImageAlpha))(
+                rect, image.get(), sx, sy, params);
     }
     void JudgeBlend(GrImage const* image, GrBlendParams const& params)
     {

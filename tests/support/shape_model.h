@@ -101,22 +101,24 @@ struct Arc {
             lower ? y + h : y + (h + 1) / 2};
     }
 
+    /// The box of a quarter in which the arc begins or ends, and what is missing there of a pie, written out
+    /// for each case.
     std::pair<GrRect, std::pair<Edge, Edge>> Trimmed(int q, int angle, bool first) const
     {
-        bool const left = (q + 1) & 2, lower = q & 2;
-        GrRect const whole = Quadrant(q);
+        auto const [l, t, r, b] = Quadrant(q);
         double const radians = angle * 0.000272707695624114;
         int const px = x + static_cast<int>(((std::cos(radians) + 1.0) * (w - 1) + 1.0) * 0.5);
         int const py = y + static_cast<int>(0.5 * (1.0 + (1.0 - std::sin(radians)) * (h - 1)));
-        GrRect const box{first == lower ? px : whole.x1, first == left ? py : whole.y1,
-            first == lower ? whole.x2 : px + 1, first == left ? whole.y2 : py + 1};
-        // From the end point to the centre's row, one edge to the centre itself and one upright.
-        int const centre = left ? whole.x2 - 1 : whole.x1;
-        int const side = first == (q % 2 != 0) ? px : centre;
-        int const from = lower ? whole.y1 : py, to = lower ? py : whole.y2 - 1;
-        Edge const slanting{lower ? centre : px, from, lower ? px : centre, to},
-            upright{side, from, side, to};
-        return {box, first == lower ? std::pair{slanting, upright} : std::pair{upright, slanting}};
+        switch (q % 4 + (first ? 0 : 4)) {
+        case 0: return {{l, t, px + 1, py + 1}, {{l, py, l, b - 1}, {px, py, l, b - 1}}};
+        case 1: return {{l, py, px + 1, b}, {{px, py, px, b - 1}, {px, py, r - 1, b - 1}}};
+        case 2: return {{px, py, r, b}, {{r - 1, t, px, py}, {r - 1, t, r - 1, py}}};
+        case 3: return {{px, t, r, py + 1}, {{l, t, px, py}, {px, t, px, py}}};
+        case 4: return {{px, py, r, b}, {{px, py, l, b - 1}, {px, py, px, b - 1}}};
+        case 5: return {{px, t, r, py + 1}, {{px, py, r - 1, b - 1}, {r - 1, py, r - 1, b - 1}}};
+        case 6: return {{l, t, px + 1, py + 1}, {{px, t, px, py}, {r - 1, t, px, py}}};
+        default: return {{l, py, px + 1, b}, {{l, t, l, py}, {l, t, px, py}}};
+        }
     }
 };
 

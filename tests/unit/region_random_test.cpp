@@ -1,5 +1,6 @@
 #include <support/region_judge.h>
 #include <support/region_text.h>
+#include <support/seed.h>
 #include <tessella/pixel/clip_walk.h>
 #include <tessella/region_cut.h>
 
@@ -200,8 +201,7 @@ void JudgeLists(int total, std::vector<int> const& lengths, std::vector<int> con
 {
     CollectAssertions();
     EXPECT_EQ(judge(kReplay), "");
-    std::uint32_t const seed = std::random_device{}();
-    std::printf("seed %u\n", seed);
+    unsigned const seed = NewSeed();
     std::mt19937 random(seed);
     auto const below = [&](auto n) { return static_cast<int>(random() % static_cast<unsigned>(n)); };
     auto const oneOf = [&](auto const& list) { return list[static_cast<std::size_t>(below(list.size()))]; };

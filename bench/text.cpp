@@ -226,10 +226,10 @@ void TextRow::AddSdl()
         SdlSurface target;
         void operator()(int y)
         {
-            for (auto const& [letter, place] : glyphs) {
+            for (auto const& [glyph, place] : glyphs) {
                 SDL_Rect box = place;
                 box.y += y;
-                SDL_BlitSurface(letter, nullptr, target.get(), &box);
+                SDL_BlitSurface(glyph, nullptr, target.get(), &box);
             }
         }
     };

@@ -23,7 +23,8 @@ zip_t* OpenZip(std::string const& path, std::uint64_t& size)
     std::unique_ptr<std::FILE, CloseStdio> file(std::fopen(path.c_str(), "rbe"));
     if (file == nullptr) return nullptr;
     auto const section = FindElfSection(file.get(), kSection);
-    if (!section || section->size > INT64_MAX) return nullptr;
+    // A size of 0 would mean all the rest of the file to libzip.
+    if (!section || section->size == 0 || section->size > INT64_MAX) return nullptr;
     zip_source_t* const source = zip_source_filep_create(
         file.get(), section->offset, static_cast<zip_int64_t>(section->size), nullptr);
     if (source == nullptr) return nullptr;
@@ -57,24 +58,24 @@ std::shared_ptr<Archive> Archive::Open(std::string path)
 Archive::Archive(std::string filePath, zip_t* openZip, std::uint64_t archiveSize)
     : path(std::move(filePath)), zip(openZip), size(archiveSize)
 {
-    if (auto const entry = FindExactly("locales")) locales = LoadText(zip, *entry);
+    if (auto const entry = FindExactly("locales"); entry && entry->isPlausible)
+        locales = LoadText(zip, *entry);
 }
 
 std::optional<ArchiveEntry> Archive::Find(std::string const& name)
 {
     std::string const language(MatchLanguage(LanguageInForce(), locales));
     std::lock_guard const lock(mutex);
-    if (!language.empty()) {
-        if (auto entry = FindExactly(language + '/' + name)) return entry;
-    }
-    return FindExactly(name);
+    auto entry = language.empty() ? std::nullopt : FindExactly(language + '/' + name);
+    if (!entry) entry = FindExactly(name);
+    return entry && entry->isPlausible ? entry : std::nullopt;
 }
 
 std::optional<ArchiveEntry> Archive::FindExactly(std::string name)
 {
     zip_stat_t status;
     bool const isFile = !name.empty() && !name.ends_with('/') && zip_stat(zip, name.c_str(), 0, &status) == 0;
-    if (!isFile || status.comp_size > size || status.size / kMaxExpansion > status.comp_size)
-        return std::nullopt;
-    return ArchiveEntry{status.index, status.size, std::move(name)};
+    if (!isFile) return std::nullopt;
+    bool const isPlausible = status.comp_size <= size && status.size / kMaxExpansion <= status.comp_size;
+    return ArchiveEntry{status.index, status.size, std::move(name), isPlausible};
 }

@@ -13,6 +13,7 @@ struct ArchiveEntry {
     std::uint64_t index;
     std::uint64_t size;  ///< unpacked
     std::string name;
+    bool isPlausible;  ///< its sizes can be true
 };
 
 /// The archive in an ELF file. Its entries are unpacked as they are read, from the file, which is never

@@ -96,7 +96,7 @@ GrFontFTDevice::Share::~Share()
     library = nullptr;
 }
 
-void GrFontFTDevice::DoneFace::operator()(FT_Face face) const { FT_Done_Face(face); }
+void GrFontFTDevice::DoneFace::operator()(FT_Face done) const { FT_Done_Face(done); }
 
 void GrFontFTDevice::DoneGlyph::operator()(FT_Glyph glyph) const { FT_Done_Glyph(glyph); }
 

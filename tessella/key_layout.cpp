@@ -116,7 +116,7 @@ std::optional<std::vector<std::unique_ptr<GrSmartKeyLayout>>> ReadKeyLayouts(
     std::span<unsigned char const> file)
 {
     // One layout is the least, even for a file that says it has none.
-    if (file.size() < sizeof(GrKeyLayoutFile) + sizeof(GrKeyLayoutRecord)) return std::nullopt;
+    if (file.size() < kLeastLayoutFile) return std::nullopt;
     std::vector<std::unique_ptr<GrSmartKeyLayout>> layouts;
     std::size_t offset = sizeof(GrKeyLayoutFile);
     for (auto left = Load<GrKeyLayoutFile>(file.data()).layoutCount; left > 0; --left) {

@@ -57,3 +57,7 @@ struct GrDeadKeyPair {
 
 static_assert(sizeof(GrKeyLayoutFile) == 4 && sizeof(GrKeyRow) == 18 && sizeof(GrKeyLayoutRecord) == 2328);
 static_assert(sizeof(GrDeadKeyRecord) == 12 && sizeof(GrDeadKeyPair) == 4);
+
+/// A file has at least its head and one layout.
+constexpr std::size_t kLeastLayoutFile = sizeof(GrKeyLayoutFile) + sizeof(GrKeyLayoutRecord);
+static_assert(kLeastLayoutFile == 2332);

@@ -7,6 +7,8 @@
 #include <tessella/keyboard_device.h>
 #include <tessella/window_state.h>
 
+#include <memory>
+#include <new>
 #include <utility>
 
 GrKeyboard* sessionKeyboard = nullptr;
@@ -175,11 +177,14 @@ bool GrSmartKeyboard::LoadLayoutStream(si_file* stream)
 {
     if (!stream) return false;
     auto const size = stream->Size();
-    layoutFile = std::make_unique_for_overwrite<unsigned char[]>(size);
-    ReadAll(*stream, layoutFile.get(), size);
+    if (size < kLeastLayoutFile) return false;
+    std::unique_ptr<unsigned char[]> bytes(new (std::nothrow) unsigned char[size]);
+    if (!bytes) return false;  // a damaged file may claim any size
+    ReadAll(*stream, bytes.get(), size);
     if (stream->error) return false;
-    auto layouts = ReadKeyLayouts({layoutFile.get(), size});
+    auto layouts = ReadKeyLayouts({bytes.get(), size});
     if (!layouts) return false;
+    layoutFile = std::move(bytes);
     for (auto& each : *layouts)
         Append(std::move(each));
     return true;

@@ -77,7 +77,8 @@ public:
     /// Adds the layouts of a file `keyboard.kbd` to the list; the first one is in force if none was. The
     /// archive has one for each language. False if there is none, or it is not whole.
     virtual bool LoadLayouts(char const* name);
-    /// The same with an open file, which may be null.
+    /// The same with an open file, which may be null. Once a keyboard: the layouts point into the file's
+    /// bytes.
     virtual bool LoadLayoutStream(si_file* stream);
     /// Control and shift were pressed together: the next layout of the list, after the last one the first, is
     /// in force from now on, and the window callback is told.

@@ -86,7 +86,7 @@ GR_API unsigned GrFindVkForChar(unsigned ch);
 /// then the window callback gets `GrEventLayoutChanged`.
 GR_API char16_t const* GrGetKeyboardLayout();
 
-/// Asks the kernel for another console, as control, alt and F1 to F10 do; the first one is 1. True if the
-/// kernel has taken the request, false without a keyboard or for a console that does not exist. A session
-/// does not let its console go yet: the request is then answered with no.
+/// Asks the kernel for another console, as control with alt or shift, and F1 to F10, do; the first one is 1.
+/// True if the kernel has taken the request, false without a keyboard or for a console that does not exist. A
+/// session does not let its console go yet: the request is then answered with no.
 GR_API bool SwitchToConsole(int number);

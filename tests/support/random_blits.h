@@ -240,10 +240,10 @@ private:
             int const x = static_cast<int>(i) % drawn->width, y = static_cast<int>(i) / drawn->width;
             if (x == 0) errors.StartRow();
             unsigned char const* const from = &stream[i * step];
-            GrColor const color = GrMakeColor(from[0], from[1], from[2], hasAlphas ? from[3] : 0);
+            GrColor const color = GrMakeColor(from[0], from[1], from[2], plane ? from[3] : 0);
             if (!dithers) {
                 canvas.Write(x, y, format.toPixel(color));
-                own[i] = from[3];
+                if (plane) own[i] = from[3];
             } else if (!hasAlphas || own[i] == 255) {
                 canvas.Write(x, y, errors.Diffuse(format, color, x));
             }

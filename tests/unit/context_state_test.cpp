@@ -190,8 +190,11 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
         void (*draw)(GrContext& c);
     };
     hideCount = 0;
-    for (auto const& [waits, draw] : {Case{true, [](auto& c) { c.FillRegion(GrRegion()); }},
-             Case{true, [](auto& c) { c.FillRegion(GrRect(2, 2, 4, 4)); }},
+    for (auto const& test : {Case{true, [](auto& c) { c.FillRegion(GrRegion()); }},
+             Case{true,
+                 [](auto& c) {
+                     c.FillRegion(GrRect{2, 2, 4, 4});
+                 }},
              Case{true, [](auto& c) { c.DrawLine(1, 1, 1, 5); }},
              Case{false, [](auto& c) { c.DrawLine(16, 1, 20, 5); }},
              Case{false, [](auto& c) { c.DrawArc(9, 9, 20, 20, 0, 5760); }},
@@ -200,12 +203,20 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
              Case{true, [](auto& c) { c.FillArc(0, -8, 20, 20, 5760, 2000); }},
              Case{true, [](auto& c) { c.DrawPixel(1, 1); }}, Case{false, [](auto& c) { c.DrawPixel(16, 1); }},
              Case{true, [](auto& c) { c.GetPixel(1, 1); }}, Case{false, [](auto& c) { c.GetPixel(1, -1); }},
-             Case{true, [](auto& c) { c.FillRegionAlpha(GrRect(1, 1, 2, 2), 9); }},
-             Case{true, [](auto& c) { c.CopyFromContext(GrRect(0, 0, 1, 1), &c, 0, 0); }},
-             Case{false, [](auto& c) { c.DrawImageAlphaDirect(GrRect(0, 0, 1, 1), nullptr, 0, 0, {}); }}}) {
+             Case{true,
+                 [](auto& c) {
+                     c.FillRegionAlpha(GrRect{1, 1, 2, 2}, 9);
+                 }},
+             Case{true,
+                 [](auto& c) {
+                     c.CopyFromContext(GrRect{0, 0, 1, 1}, &c, 0, 0);
+                 }},
+             Case{false, [](auto& c) {
+                      c.DrawImageAlphaDirect(GrRect{0, 0, 1, 1}, nullptr, 0, 0, {});
+                  }}}) {
         screenMutex.lock();
-        auto const drawn = std::async(std::launch::async, [&] { draw(*context); });
-        if (waits)
+        auto const drawn = std::async(std::launch::async, [&] { test.draw(*context); });
+        if (test.waits)
             EXPECT_EQ(drawn.wait_for(std::chrono::milliseconds(30)), std::future_status::timeout);
         else
             drawn.wait();

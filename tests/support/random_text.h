@@ -106,9 +106,9 @@ private:
             Strike(left, glyphTop, glyph, transparent);
             if (font.embolden && !transparent) {
                 bool const grey = glyph.bitsPerPixel != 1;
-                for (int v = 0; v < rows; ++v)
-                    BackByPattern(left + width - (grey ? canvas.originX : 0),
-                        glyphTop + v - (grey ? canvas.originY : 0));
+                int const u = left + width - grey * canvas.originX, v = glyphTop - grey * canvas.originY;
+                for (int i = v; i < v + rows; ++i)
+                    if (canvas.InClip(u, i) && canvas.PatternPaints(u, i)) canvas.Write(u, i, canvas.back);
             }
             if (font.embolden) Strike(left + 1, glyphTop, glyph, true);
             pen += static_cast<int>(glyph.advance) + font.embolden;
@@ -116,11 +116,6 @@ private:
         for (int v = top; !transparent && v < top + static_cast<int>(font.height); ++v)
             for (int u = first; u < pen; ++u)
                 if (!boxes.contains({u, v}) && canvas.InClip(u, v)) canvas.Write(u, v, canvas.back);
-    }
-
-    void BackByPattern(int x, int y)
-    {
-        if (canvas.InClip(x, y) && canvas.PatternPaints(x, y)) canvas.Write(x, y, canvas.back);
     }
 
     void Strike(int left, int top, GrGlyphInfo const& glyph, bool transparent)

@@ -96,9 +96,9 @@ GrFontFTDevice::Share::~Share()
     library = nullptr;
 }
 
-void GrFontFTDevice::DoneFace::operator()(FT_Face done) const { FT_Done_Face(done); }
+void GrFontFTDevice::DoneFace::operator()(FT_Face opened) const { FT_Done_Face(opened); }
 
-void GrFontFTDevice::DoneGlyph::operator()(FT_Glyph glyph) const { FT_Done_Glyph(glyph); }
+void GrFontFTDevice::DoneGlyph::operator()(FT_Glyph loaded) const { FT_Done_Glyph(loaded); }
 
 GrFontFTDevice::GrFontFTDevice(GrFontDesc const& desc) : GrFontBase(desc.flags.smooth, desc.weight)
 {

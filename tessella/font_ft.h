@@ -35,10 +35,10 @@ private:
         Share& operator=(Share const&) = delete;
     } share;
     struct DoneFace {
-        void operator()(FT_FaceRec_* face) const;
+        void operator()(FT_FaceRec_* opened) const;
     };
     struct DoneGlyph {
-        void operator()(FT_GlyphRec_* glyph) const;
+        void operator()(FT_GlyphRec_* loaded) const;
     };
     using GlyphPtr = std::unique_ptr<FT_GlyphRec_, DoneGlyph>;
     using GlyphPage = std::array<GlyphPtr, 256>;

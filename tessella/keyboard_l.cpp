@@ -53,6 +53,7 @@ private:
 KeyRing keyRing;  // guarded by keyRingMutex
 
 std::atomic<int> consoleTty{-1};
+std::atomic<int> returnNotice{-1};  // the end of a pipe that is written when the console comes back
 static_assert(std::atomic<int>::is_always_lock_free, "signal handlers read it");
 
 /// False if the byte is lost. On the keyboard's thread.
@@ -130,6 +131,8 @@ private:
     bool Request(unsigned long request, long number) const { return ioctl(tty, request, number) == 0; }
     void TakeConsole();
     void GiveConsoleBack();
+    void ReadKey() const;
+    void TakeReturnNotice() const;
     static void* ReadKeys(void* keyboard);
 
     // As they were found. What could not be learned is not sent back.
@@ -140,6 +143,7 @@ private:
     int tty = -1;
     vt_mode vtMode{};
     bool hasConsole = false;
+    std::array<int, 2> returnPipe{-1, -1};  ///< the end that the thread reads, the end that is written
     InputThread thread;
 };
 
@@ -170,6 +174,7 @@ void GrLinuxKeyboard::TakeConsole()
     vtMode.mode = VT_PROCESS;
     vtMode.relsig = vtMode.acqsig = SIGUSR2;
     consoleTty = tty;
+    if (pipe2(returnPipe.data(), O_NONBLOCK | O_CLOEXEC) == 0) returnNotice = returnPipe[1];
     signal(SIGUSR2, GrConsoleSignal);
     ioctl(tty, VT_SETMODE, &vtMode);
 }
@@ -181,6 +186,9 @@ void GrLinuxKeyboard::GiveConsoleBack()
     vtMode.mode = VT_AUTO;
     ioctl(tty, VT_SETMODE, &vtMode);
     consoleTty = -1;
+    if (returnNotice.exchange(-1) != -1)
+        for (int const end : returnPipe)
+            close(end);
     if (savedTerminal) tcsetattr(tty, TCSANOW, &*savedTerminal);
 }
 
@@ -196,11 +204,25 @@ bool GrLinuxKeyboard::Close()
 void* GrLinuxKeyboard::ReadKeys(void* keyboard)
 {
     auto const& self = *static_cast<GrLinuxKeyboard const*>(keyboard);
-    while (self.thread.WaitForInput(self.tty, InputThread::PollFailure::Ends)) {
-        unsigned char byte = 0;
-        if (read(self.tty, &byte, 1) == 1 && GrKeyRingPush(byte)) GrPostInputWake();
-    }
-    return nullptr;
+    int const devices[] = {self.tty, self.returnPipe[0]};
+    for (;;)
+        switch (self.thread.WaitForInput(devices, InputThread::PollFailure::Ends)) {
+        case 0: self.ReadKey(); break;
+        case 1: self.TakeReturnNotice(); break;
+        default: return nullptr;
+        }
+}
+
+void GrLinuxKeyboard::ReadKey() const
+{
+    unsigned char byte = 0;
+    if (read(tty, &byte, 1) == 1 && GrKeyRingPush(byte)) GrPostInputWake();
+}
+
+void GrLinuxKeyboard::TakeReturnNotice() const
+{
+    unsigned char notice = 0;
+    if (read(returnPipe[0], &notice, 1) == 1) GrUnfreeze();
 }
 
 /// Control with alt or shift, and F1 to F10: these ask for another console, at the release as well.
@@ -228,3 +250,9 @@ void GrKeyboardDestroy()
 }
 
 int ConsoleTty() { return consoleTty; }
+
+void WakeAfterReturn()
+{
+    // A pipe that is full has enough to wake the pump.
+    [[maybe_unused]] ssize_t const written = write(returnNotice, "", 1);
+}

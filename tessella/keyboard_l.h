@@ -9,3 +9,7 @@ void GrKeyboardDestroy();
 
 /// The tty that the session holds, -1 if none. For handlers of signals, too.
 int ConsoleTty();
+
+/// Has the keyboard's thread unfreeze the pump, so that the application repaints a screen that has come back.
+/// For handlers of signals: it locks nothing, and leaves the rest to the thread.
+void WakeAfterReturn();

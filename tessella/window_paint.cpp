@@ -8,6 +8,8 @@
 // event is computed when it is asked for: the first invalid point has an owner, who gets all that is invalid
 // of him in one go. So a pass has about as many events as windows that are touched.
 
+constinit std::atomic<bool> screenLost{false};
+
 namespace {
 
 constexpr char kSource[] = GR_SOURCE("tessella/window");
@@ -56,8 +58,14 @@ void WalkPaint(GrRegion& area, GrEvent& event)
 
 }
 
+void InvalidateLostScreen()
+{
+    if (screenLost.load(std::memory_order_relaxed) && screenLost.exchange(false)) Screen.FullInvalidate(true);
+}
+
 bool GrWindow::IsInvalidated() const
 {
+    InvalidateLostScreen();
     for (GrWindow const* window = this; window; window = window->parent)
         if (window->flags & GrWindowInvalidated) return true;
     return (Screen.flags & GrWindowInvalidated) != 0;
@@ -91,6 +99,7 @@ void GrWindow::FullInvalidate(bool force)
 
 void GrWindow::ResetInvalidated()
 {
+    InvalidateLostScreen();
     for (GrWindow* child = first; child; child = child->next)
         if (child->flags & GrWindowInvalidated) child->ResetInvalidated();
     flags &= ~GrWindowInvalidated;
@@ -106,6 +115,7 @@ bool GrWindow::GetPaintEvent(GrEvent* event)
 
 bool GrWindow::GetPaintEvent(GrEvent* event, GrRegion& area)
 {
+    InvalidateLostScreen();
     area -= ValidRegion;
     if (!area) return false;
     if (event) WalkPaint(area, *event);

@@ -87,6 +87,6 @@ GR_API unsigned GrFindVkForChar(unsigned ch);
 GR_API char16_t const* GrGetKeyboardLayout();
 
 /// Asks the kernel for another console, as control with alt or shift, and F1 to F10, do; the first one is 1.
-/// True if the kernel has taken the request, false without a keyboard or for a console that does not exist. A
-/// session does not let its console go yet: the request is then answered with no.
+/// True if the kernel has taken the request, false without a keyboard or for a console that does not exist.
+/// The session lets its console go as soon as nobody draws; see `GrInit`.
 GR_API bool SwitchToConsole(int number);

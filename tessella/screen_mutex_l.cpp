@@ -26,12 +26,11 @@ long Futex(
 bool ScreenMutex::try_lock()
 {
     std::uint64_t const self = Self();
-    if (state.load(std::memory_order_relaxed) % kOnce == self) {
-        state.fetch_add(kOnce, std::memory_order_relaxed);
-        return true;
-    }
-    std::uint64_t nobody = 0;
-    return state.compare_exchange_strong(nobody, self + kOnce);
+    std::uint64_t before = state.load(std::memory_order_relaxed);
+    do
+        if (before != 0 && before % kOnce != self) return false;
+    while (!state.compare_exchange_weak(before, before == 0 ? self + kOnce : before + kOnce));
+    return true;
 }
 
 void ScreenMutex::lock()

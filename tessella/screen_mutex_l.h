@@ -19,7 +19,8 @@ public:
 private:
     bool Take(std::chrono::nanoseconds const* limit);
 
-    // Holder and depth change in one step, so that an interrupted thread finds them true.
+    // Holder and depth change in one step, so that a handler finds them true, and a thread notices what a
+    // handler has done.
     std::atomic<std::uint64_t> state{0};     ///< the holding thread, with how often it holds from bit 48 up
     std::atomic<std::uint32_t> waiting{0};   ///< threads that sleep, or are about to
     std::atomic<std::uint32_t> releases{0};  ///< what they sleep on; counted while there are any

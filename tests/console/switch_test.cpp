@@ -15,6 +15,7 @@
 #include <functional>
 #include <future>
 #include <memory>
+#include <mutex>
 #include <random>
 #include <thread>
 
@@ -229,20 +230,23 @@ TEST(Switch, AStormDuringDrawingAndMotion)
     int const count = wish ? std::atoi(wish) / 1000 : 100;
     OnConsole("160x120x32", nullptr, [&](VirtualConsole& screen) {
         Desk desk(screen);
-        std::atomic<bool> over{false}, moves{true};
+        std::atomic<bool> over{false};
+        std::mutex motion;
         auto mouse = Beside([&] {
-            for (int i = 0; !over; ++i, std::this_thread::yield())
-                if (moves) screen.MoveMouse(i / 50 % 2 * 2 - 1, i / 30 % 2 * 2 - 1);
+            for (int i = 0; !over; ++i, std::this_thread::yield()) {
+                std::scoped_lock const lock(motion);
+                screen.MoveMouse(i / 50 % 2 * 2 - 1, i / 30 % 2 * 2 - 1);
+            }
         });
         auto user = Beside([&] {
             std::mt19937 random(11);
             for (int i = 0; i < count; ++i) {
 #ifdef __SANITIZE_THREAD__  // see above
-                moves = false;
+                std::scoped_lock const noMotion(motion);
                 Await("rest", [&] { return screen.IsMouseRead(); });
+                Sleep(10);
 #endif
                 SwitchTo(screen, 2 + random() % 3);
-                moves = true;
                 if (random() % 2) std::this_thread::sleep_for(std::chrono::microseconds(random() % 2000));
                 SwitchTo(screen, 1);
                 if (random() % 2) std::this_thread::sleep_for(std::chrono::microseconds(random() % 4000));

@@ -17,7 +17,6 @@ KEY_SECONDS = 0.01
 SWITCH_SECONDS = 0.05
 OPENED_SECONDS = 0.5
 
-PLUG_MOUSE = "insmod /mouse.ko; until grep -q Mouse /proc/bus/input/devices; do usleep 50000; done"
 # In the background: the machine stays free for further commands.
 START = (
     "rm -f /tmp/status; (sh -c 'echo $$ > /tmp/pid; exec env LC_ALL={language} {program} > /tmp/output 2>&1';"
@@ -59,7 +58,7 @@ class Player:
     def play(self, steps: list[str], program: object, language: str) -> list[str]:
         """Starts the program and returns what it wrote, on both streams, when it has ended. It has the
         console meanwhile; if it ends by itself, the console is as it was, else nobody has given it back."""
-        self._real.run(PLUG_MOUSE)
+        self._real.run(machine.PLUG_MOUSE)
         before = self._console_state()
         self._real.run(START.format(program=program, language=language))
         for step in steps:

@@ -37,11 +37,11 @@ public:
     GrFont& operator=(GrFont const&) = delete;
     virtual ~GrFont() = default;
 
-    /// The font for a request, which the caller deletes, during a session. `face` names a face, and the font's
-    /// file where the table of fonts names none; null counts as "". `size` is in thousandths of 96 pixels: 140
-    /// makes scalable letters 13 pixels high; of the pixels the low eight bits count. `weight` is 400 for
-    /// regular and 700 for bold letters; `smooth` asks for grey levels, `kerning` for pairs of letters being
-    /// moved together. Never fails and never returns null: when the font that was asked for
+    /// The font for a request, which the caller deletes, during a session. `face` names a face, and the
+    /// font's file where the table of fonts names none; null counts as "". `size` is in thousandths of 96
+    /// pixels: 140 makes scalable letters 13 pixels high; of the pixels the low eight bits count. `weight` is
+    /// 400 for regular and 700 for bold letters; `smooth` asks for grey levels, `kerning` for pairs of
+    /// letters being moved together. Never fails and never returns null: when the font that was asked for
     /// cannot be had, for whatever reason, it is the built-in one, which has one size and one weight. The
     /// reason then stands on the standard error stream. If the library's own resources are missing, too, the
     /// font is not valid, and draws nothing.

@@ -28,8 +28,8 @@ ConsoleState ReadConsole(int tty);
 /// What a console is like when the system has just started, and no console to switch to.
 ConsoleState FreshConsole();
 
-/// Puts a console into a state. Whoever had a say in console switches loses it, lights follow the locks again.
-/// False if something was refused; everything else is done all the same.
+/// Puts a console into a state. Whoever had a say in console switches loses it, lights follow the locks
+/// again. False if something was refused; everything else is done all the same.
 bool RestoreConsole(int tty, ConsoleState const& state);
 
 }

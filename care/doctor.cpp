@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <exception>
 #include <string_view>
 
 #include <nlohmann/json.hpp>
@@ -12,16 +13,16 @@ namespace {
 
 constexpr char kHelp[] = R"(Usage: tessella-doctor [--json]
 
-Looks at everything that a program on the console needs: the screen, the console with its keyboard, the mouse, and
-the library's own resources. Says in plain words what is wrong and what helps. Changes nothing.
+Looks at everything that a program on the console needs: the screen, the console with its keyboard, the mouse,
+and the library's own resources. Says in plain words what is wrong and what helps. Changes nothing.
 
   --json      the same as JSON: an array of objects with "part", "state" ("fine", "limits" or "unusable"),
               "seen" and "mend"
   --help      show this
   --version   show the version
 
-The exit status is 0 if all is fine, 1 if programs run with limits, 2 if they don't run, or if the command line is
-wrong.
+The exit status is 0 if all is fine, 1 if programs run with limits, 2 if they don't run, or if the command
+line is wrong.
 )";
 
 char const* NameOf(care::Severity severity)
@@ -51,9 +52,7 @@ void PrintJson(care::Findings const& findings)
     std::puts(all.dump(2, ' ', false, nlohmann::json::error_handler_t::replace).c_str());
 }
 
-}
-
-int main(int count, char** words)
+int Follow(int count, char** words)
 {
     std::string_view const word = count > 1 ? words[1] : "";
     if (word == "--help") return std::fputs(kHelp, stdout), 0;
@@ -68,4 +67,16 @@ int main(int count, char** words)
     word == "--json" ? PrintJson(findings) : PrintText(findings);
     auto const worst = std::ranges::max(findings, {}, &care::Finding::severity).severity;
     return static_cast<int>(worst);
+}
+
+}
+
+int main(int count, char** words)
+{
+    try {
+        return Follow(count, words);
+    } catch (std::exception const& error) {
+        std::fprintf(stderr, "tessella-doctor: failed: %s\n", error.what());
+        return 2;
+    }
 }

@@ -18,21 +18,23 @@ constexpr char kHelp[] =
     R"(Usage: tessella-run [--] PROGRAM [ARGUMENT]...
        tessella-run --restore [--tty DEVICE]
 
-Runs a program, and when it has ended, however it did, puts the console back as it was before: keyboard mode,
-locks and lights, terminal settings, text or graphics, switching between consoles, and the console that is shown.
+Runs a program, and when it has ended, however it did, puts the console back as it was before: keyboard
+mode, locks and lights, terminal settings, text or graphics, switching between consoles, and the console that
+is shown.
 
-  --restore      run nothing; make a console usable that a program has left in a bad state: put it back to what
-                 the system's start gives. From another console, over the network, or blindly
+  --restore      run nothing; make a console usable that a program has left in a bad state: put it back to
+                 what the system's start gives. From another console, over the network, or blindly
   --tty DEVICE   the console to restore, such as /dev/tty1; without it the one that is shown
   --help         show this
   --version      show the version
 
-While the program holds the console, what it writes to the standard error stream can't be read there. The last
-64 KiB of it are kept, if that stream is a terminal, and shown at the end. SIGHUP, SIGINT, SIGQUIT and SIGTERM
-are passed on to the program.
+While the program holds the console, what it writes to the standard error stream can't be read there. The
+last 64 KiB of it are kept, if that stream is a terminal, and shown at the end. SIGHUP, SIGINT, SIGQUIT and
+SIGTERM are passed on to the program.
 
-The exit status is the program's, or 128 and the signal's number if one killed it; 127 if the program couldn't be
-run; with --restore 0, or 1 if the console couldn't be put back in every respect; 2 if the command line is wrong.
+The exit status is the program's, or 128 and the signal's number if one killed it; 127 if the program
+couldn't be run; with --restore 0, or 1 if the console couldn't be put back in every respect; 2 if the command
+line is wrong.
 )";
 
 constexpr int kNotRestored = 1;

@@ -111,7 +111,8 @@ TEST(Doctor, NamesEveryFaultAndWhatHelps)
         {1, "--fault OPEN_TTY=EACCES", "", "no keyboard: /dev/tty0 can't be opened: Permission", "as root"},
         {1, "--fault KDSKBMODE=EPERM", "", "can't be read key by key", "login on this console"},
         {1, "--fault KDGETMODE=EIO", "", "doesn't tell all of its state", "tessella-run --restore"},
-        {2, "", Taking("sleep 9") + " & sleep 0.5; ", "another program draws", "tessella-run --restore"},
+        {2, "", Taking("sleep 9") + " & until " CONSOLE_STATE " | grep -q 'screen 1'; do :; done; ",
+            "another program draws", "tessella-run --restore"},
         {1, "--fault OPEN_MOUSE=ENOENT", "", "/dev/input/mice can't be opened", "modprobe mousedev"},
         {2, "", withoutArchive, "has no archive", "Install the library again"},
     };

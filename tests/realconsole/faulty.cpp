@@ -1,5 +1,5 @@
 // A program on a text console that ends in a segmentation fault, as its argument says: at a key, in the paint
-// handler of what a key has made due, or while the mouse moves; else when somebody sends it the signal.
+// handler of what a key has made due, or in the midst of the mouse's motion; else when it is sent the signal.
 
 #include <tessella.h>
 
@@ -13,7 +13,7 @@ int main(int, char** words)
     if (!GrInit(width, height, depth, 0)) return 1;
     GrEvent event;
     bool painted = false;
-    for (int moves = 0; moves < 30 || wanted != "mouse";) {
+    for (int moves = 0; moves < 10 || wanted != "mouse";) {
         if (!GrGetEvent(event, nullptr)) continue;
         if (event.type == GrEventMouseMove) ++moves;
         bool const pressed = event.type == GrEventKeyDown;

@@ -123,9 +123,17 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     y = Moved(y, this->originY);
     w = Moved(w, 1);
     h = Moved(h, 1);
+    auto* const base = this->PixelBase();
+    auto const pitch = static_cast<std::uint32_t>(this->Stride());
     GrArcState arc;
-    ArcSetup(arc, x, y, w, h, start, sweep, this->PixelBase(), static_cast<std::uint32_t>(this->Stride()),
-        this->clip);
+    GrRect const box{x, y, Moved(x, w), Moved(y, h)};
+    if (IsWholeTurn(sweep) && this->IsSolid() && IsOneRectangle(this->clip) && !box.IsEmpty() &&
+        CoverageOf(box, this->clip) == Coverage::All) {
+        typename S::Guard const guard(box);
+        WalkSetup(arc, x, y, w, h, base, pitch);
+        return DrawOutline(arc);
+    }
+    ArcSetup(arc, x, y, w, h, start, sweep, base, pitch, this->clip);
     GrRegion const& region = arc.region;
     if (!region) return;
     typename S::Guard const guard(region);
@@ -134,18 +142,69 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     for (int q = 0; q < 4; ++q)
         quadrants[q] = CoverageOf(QuadrantBox(q, x, y, w, h), region);
     auto const isWhole = [](Coverage coverage) { return coverage == Coverage::All; };
-    if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) {
-        WalkOutline(walk, [this, pixel = this->foreColor](int, std::uintptr_t address, int column, int) {
-            this->WritePixel(RowAt(address), column, pixel);
-        });
-        return;
-    }
+    if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) return DrawOutline(arc);
     WalkOutline(walk, [&](int quadrant, std::uintptr_t address, int column, int line) {
         Coverage const coverage = quadrants[quadrant];
         if (coverage == Coverage::All || (coverage == Coverage::Part && region.Contains(column, line)))
             this->PatternPixel(
                 RowAt(address), column, this->pattern[line & 7], this->patternTransparent, this->rasterMode);
     });
+}
+
+/// Paints the points of an ellipse that the clip does not touch, some in the middle twice. Where the next one
+/// is is as good as random, so masks decide it, and no branches.
+template <typename S>
+void GrGenericContextBase<S>::DrawOutline(GrArcState const& arc) const
+{
+    auto const pixel = this->foreColor;
+    auto const stepX = static_cast<std::uint64_t>(arc.stepX), stepY = static_cast<std::uint64_t>(arc.stepY);
+    auto const pitch = this->Stride();
+    auto const maskOf = [](std::uint64_t term) { return static_cast<std::int64_t>(term) >> 63; };
+    auto decision = static_cast<std::uint64_t>(arc.decision);
+    std::uint64_t nextSpan = static_cast<std::uint64_t>(arc.spanTerm) - stepX;
+    std::uint64_t nextRow = static_cast<std::uint64_t>(arc.rowTerm) + stepY;
+    unsigned char* upper = this->PixelAddress(RowAt(arc.upperAddress), arc.left);
+    unsigned char* lower = this->PixelAddress(RowAt(arc.lowerAddress), arc.left);
+    std::ptrdiff_t reach = std::ptrdiff_t{arc.right} - arc.left;
+    auto const paint = [&] {
+        for (unsigned char* const address : {upper, lower}) {
+            this->WritePixel(address, 0, pixel);
+            this->WritePixel(address + reach * S::kBytes, 0, pixel);
+        }
+    };
+    std::int64_t rows = std::int64_t{arc.upperRow} - arc.topRow;
+
+    // Steep: with each point the rows move, and the columns may.
+    for (;; --rows) {
+        if (rows < 0) return;
+        paint();
+        if (reach < 2) return;
+        std::int64_t const inward = maskOf(decision);
+        decision += nextSpan & static_cast<std::uint64_t>(inward);
+        nextSpan -= stepX & static_cast<std::uint64_t>(inward);
+        reach += 2 * inward;
+        upper += S::kBytes & inward;
+        lower += S::kBytes & inward;
+        if (maskOf(decision)) break;
+        upper -= pitch;
+        lower += pitch;
+        decision -= nextRow;
+        nextRow += stepY;
+    }
+    // Flat, and never steep again: with each point the columns move, and the rows may.
+    while (rows >= 0) {
+        paint();
+        if (reach < 2) return;
+        decision += nextSpan;
+        nextSpan -= stepX;
+        reach -= 2;
+        std::int64_t const outward = ~maskOf(decision);
+        decision -= nextRow & static_cast<std::uint64_t>(outward);
+        nextRow += stepY & static_cast<std::uint64_t>(outward);
+        rows += outward;
+        upper += S::kBytes - (pitch & outward);
+        lower += S::kBytes + (pitch & outward);
+    }
 }
 
 /// Has the points of the ellipse painted, each with the quadrant that it lies in.

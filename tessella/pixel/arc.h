@@ -135,5 +135,5 @@ private:
 
 enum class Coverage { None, Part, All };
 
-/// How much of a rectangle, which is not empty, a region holds.
+/// How much of a rectangle a region holds; nothing of an empty one.
 Coverage CoverageOf(GrRect const& rect, GrRegion const& region);

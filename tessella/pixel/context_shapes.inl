@@ -127,7 +127,7 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     auto const pitch = static_cast<std::uint32_t>(this->Stride());
     GrArcState arc;
     GrRect const box{x, y, Moved(x, w), Moved(y, h)};
-    if (IsWholeTurn(sweep) && this->IsSolid() && IsOneRectangle(this->clip) && !box.IsEmpty() &&
+    if (IsWholeTurn(sweep) && this->IsSolid() && IsOneRectangle(this->clip) &&
         CoverageOf(box, this->clip) == Coverage::All) {
         typename S::Guard const guard(box);
         WalkSetup(arc, x, y, w, h, base, pitch);
@@ -151,18 +151,17 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     });
 }
 
-/// Paints the points of an ellipse that the clip does not touch, some in the middle twice. Where the next one
-/// is is as good as random, so masks decide it, and no branches.
+/// Paints the points of an ellipse that lies on the surface and within the clip, some in the middle twice.
+/// Where the next point is is as good as random, so masks decide it, and no branches.
 template <typename S>
 void GrGenericContextBase<S>::DrawOutline(GrArcState const& arc) const
 {
     auto const pixel = this->foreColor;
-    auto const stepX = static_cast<std::uint64_t>(arc.stepX), stepY = static_cast<std::uint64_t>(arc.stepY);
-    auto const pitch = this->Stride();
-    auto const maskOf = [](std::uint64_t term) { return static_cast<std::int64_t>(term) >> 63; };
-    auto decision = static_cast<std::uint64_t>(arc.decision);
-    std::uint64_t nextSpan = static_cast<std::uint64_t>(arc.spanTerm) - stepX;
-    std::uint64_t nextRow = static_cast<std::uint64_t>(arc.rowTerm) + stepY;
+    std::int64_t const stepX = arc.stepX, stepY = arc.stepY;
+    std::ptrdiff_t const pitch = this->Stride();
+    std::int64_t decision = arc.decision;
+    std::int64_t nextSpan = arc.spanTerm - stepX;
+    std::int64_t nextRow = arc.rowTerm + stepY;
     unsigned char* upper = this->PixelAddress(RowAt(arc.upperAddress), arc.left);
     unsigned char* lower = this->PixelAddress(RowAt(arc.lowerAddress), arc.left);
     std::ptrdiff_t reach = std::ptrdiff_t{arc.right} - arc.left;
@@ -172,36 +171,33 @@ void GrGenericContextBase<S>::DrawOutline(GrArcState const& arc) const
             this->WritePixel(address + reach * S::kBytes, 0, pixel);
         }
     };
-    std::int64_t rows = std::int64_t{arc.upperRow} - arc.topRow;
-
-    // Steep: with each point the rows move, and the columns may.
-    for (;; --rows) {
-        if (rows < 0) return;
+    // Steep: from point to point the rows move, and the columns may. Rows move only as long as a point of the
+    // next one lies within the ellipse, so the outline does not leave its box.
+    for (;;) {
         paint();
         if (reach < 2) return;
-        std::int64_t const inward = maskOf(decision);
-        decision += nextSpan & static_cast<std::uint64_t>(inward);
-        nextSpan -= stepX & static_cast<std::uint64_t>(inward);
+        std::int64_t const inward = decision >> 63;
+        decision += nextSpan & inward;
+        nextSpan -= stepX & inward;
         reach += 2 * inward;
         upper += S::kBytes & inward;
         lower += S::kBytes & inward;
-        if (maskOf(decision)) break;
+        if (decision < 0) break;
         upper -= pitch;
         lower += pitch;
         decision -= nextRow;
         nextRow += stepY;
     }
-    // Flat, and never steep again: with each point the columns move, and the rows may.
-    while (rows >= 0) {
+    // Flat, and never steep again: the columns move, and the rows may.
+    for (;;) {
         paint();
         if (reach < 2) return;
         decision += nextSpan;
         nextSpan -= stepX;
         reach -= 2;
-        std::int64_t const outward = ~maskOf(decision);
-        decision -= nextRow & static_cast<std::uint64_t>(outward);
-        nextRow += stepY & static_cast<std::uint64_t>(outward);
-        rows += outward;
+        std::int64_t const outward = ~(decision >> 63);
+        decision -= nextRow & outward;
+        nextRow += stepY & outward;
         upper += S::kBytes - (pitch & outward);
         lower += S::kBytes + (pitch & outward);
     }

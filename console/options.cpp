@@ -19,8 +19,8 @@ at the device paths where programs look for them. No root, no device and no chan
   --print-steps               print the single steps that the script comes down to, and run nothing
   --fault REQUEST=ERRNO       let a call fail, always. May be repeated. REQUEST is OPEN_FB, OPEN_TTY,
                               OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
-                              FBIOGET_VSCREENINFO, FBIOPUTCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE, KDSETMODE,
-                              KDGKBLED, KDSKBLED, VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP,
+                              FBIOGET_VSCREENINFO, FBIOPUTCMAP, FBIOGETCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE,
+                              KDSETMODE, KDGKBLED, KDSKBLED, VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP,
                               VT_ACTIVATE), or the path of one device, whose opening fails. ERRNO is a name
                               (ENODEV) or a number
   --report BITS:RED,GREEN,BLUE

@@ -1,6 +1,6 @@
 // Overlapping windows to play with: a click raises a window, dragging moves it, the wheel lowers and raises
-// it, a right click hides it. A click on the ground shows the hidden ones again, a right click there ends. All
-// of it works by keys, too: F10 turns the arrow yellow, and keys move it and press its buttons.
+// it, a right click hides it. A click on the ground shows the hidden ones again, a right click there ends.
+// Keys can do it without a mouse: F10 turns the arrow yellow, and they move it and press its buttons.
 //
 // Each window paints a pattern of its own, and tally marks that tell how often it was asked to paint.
 #include <tessella.h>

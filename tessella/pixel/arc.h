@@ -106,8 +106,8 @@ constexpr bool IsWholeTurn(int sweep) { return sweep <= -360 * 64 || sweep >= 36
 void WalkSetup(GrArcState& arc, int x, int y, int w, int h, unsigned char* base, std::uint32_t stride);
 
 /// Sets up the arc in the box of `w` by `h` pixels at `x`, `y`, in surface coordinates, from angle `start` on
-/// by `sweep`, in 64ths of a degree, anticlockwise. The region of an arc with an empty box is empty, and it has
-/// no wedges.
+/// by `sweep`, in 64ths of a degree, anticlockwise. The region of an arc with an empty box is empty, and it
+/// has no wedges.
 void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep, unsigned char* base,
     std::uint32_t stride, GrRegion const& clip);
 

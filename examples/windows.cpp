@@ -1,5 +1,6 @@
 // Overlapping windows to play with: a click raises a window, dragging moves it, the wheel lowers and raises
 // it, a right click hides it. A click on the ground shows the hidden ones again, a right click there ends.
+// Keys can do it without a mouse: F10 turns the arrow yellow, and they move it and press its buttons.
 //
 // Each window paints a pattern of its own, and tally marks that tell how often it was asked to paint.
 #include <tessella.h>
@@ -141,7 +142,7 @@ void BuildWindows()
 }
 
 /// An arrow with its tip as the hot spot: '#' is ink, '.' paper, anything else is seen through.
-std::unique_ptr<GrCursor> MakeArrow()
+std::unique_ptr<GrCursor> MakeArrow(GrColor paper)
 {
     static constexpr char const* kRows[] = {"#", "##", "#.#", "#..#", "#...#", "#....#", "#.....#",
         "#......#", "#.......#", "#........#", "#.....#####", "#..#..#", "#.# #..#", "##  #..#", "#    #..#",
@@ -151,11 +152,23 @@ std::unique_ptr<GrCursor> MakeArrow()
     for (int y = 0; y < height; ++y)
         for (int x = 0, end = static_cast<int>(std::strlen(kRows[y])); x < width; ++x) {
             char const dot = x < end ? kRows[y][x] : ' ';
-            GrColor const color = dot == '.' ? GrMakeColor(255, 255, 255) : dot == '#' ? kInk : 0;
+            GrColor const color = dot == '.' ? paper : dot == '#' ? kInk : 0;
             std::memcpy(image->pixels + (y * width + x) * 4, &color, 4);
             image->alphaPlane[y * width + x] = dot == ' ' ? 0 : 255;
         }
     return std::unique_ptr<GrCursor>(GrCursor::CreateInstance(image.release(), nullptr, 0, 0));
+}
+
+/// The arrow is white, and yellow while keys move it.
+struct Arrows {
+    std::unique_ptr<GrCursor> white = MakeArrow(GrMakeColor(255, 255, 255));
+    std::unique_ptr<GrCursor> yellow = MakeArrow(GrMakeColor(255, 208, 32));
+};
+
+void ShowArrow(void* arrows, bool movedByKeys)
+{
+    auto const& [white, yellow] = *static_cast<Arrows*>(arrows);
+    (movedByKeys ? yellow : white)->Activate();
 }
 
 /// Brings a window, and the family that it belongs to, to the top.
@@ -176,8 +189,8 @@ int main(int, char** argv)
     }
     GrWindow::SetCallback(OnWindowEvent);
     BuildWindows();
-    auto const arrow = MakeArrow();
-    arrow->Activate();
+    Arrows arrows;
+    GrSetMouseEmulationNotify(ShowArrow, &arrows);
 
     GrWindow* dragged = nullptr;
     int grabX = 0, grabY = 0;  // where on it the pointer holds the dragged window

@@ -32,7 +32,7 @@ void Answer(int answer)
 }
 
 /// Waits for drawing on other threads to end. A user who loses patience asks again meanwhile; such requests
-/// are let in here, to be dropped for the busy handler's sake. From the answer on the signal means a return,
+/// are let in here, and dropped, since the handler is busy. From the answer on the signal means a return,
 /// and is kept out until the handler has ended.
 void TakeScreen()
 {

@@ -5,8 +5,8 @@
 #include <cstdint>
 
 /// A recursive mutex that a signal handler may take, and another run of the handler give back, whatever its
-/// thread was doing with it at that moment. The system's own cannot be interrupted so: between becoming locked
-/// and knowing by whom, the thread would wait for itself.
+/// thread was doing with it at that moment. The system's own cannot be interrupted so: between becoming
+/// locked and knowing by whom, the thread would wait for itself.
 class ScreenMutex {
 public:
     void lock();

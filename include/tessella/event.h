@@ -69,6 +69,7 @@ struct GrEvent {
 };
 
 /// Takes the next event, in this order: paint, keys, mouse. Paint is looked for once, when the call begins.
+/// Keys may move the pointer instead of coming as keys (`GrSetMouseEmulationNotify`).
 /// If there is no event it waits, letting other threads have the library meanwhile (`GrGrabInput`).
 ///
 /// `timeout` limits the wait: null means no limit, and {0, 0} not to wait at all. Attention: `tv_usec` counts

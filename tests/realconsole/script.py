@@ -68,7 +68,7 @@ class Player:
                 self._check_console(TAKEN)
         self._await(HAS_ENDED)
         status = int(self._real.run("cat /tmp/status")[1][0])
-        output = self._real.run("cat /tmp/output")[1]
+        output = self._real.run("awk 1 /tmp/output")[1]  # which ends the last line, too
         if status != (TERMINATED if steps[-1] == "quit" else 0):
             raise ScriptError(f"{program} ended with status {status}: {output}")
         self._check_console(LEFT if steps[-1] == "quit" else re.compile(re.escape(before)))

@@ -10,7 +10,6 @@
 #include <climits>
 #include <cstdlib>
 #include <memory>
-#include <new>
 
 namespace {
 
@@ -72,10 +71,7 @@ private:
 si_file* ZipOpen(char const* name)
 {
     BundleApi::FileHandle* const handle = BundleApi::OpenFile(GetZipModule(), name, nullptr);
-    if (handle == nullptr) return nullptr;
-    auto* const file = new (std::nothrow) SIFileWrapper(handle);
-    if (file == nullptr) BundleApi::CloseFile(handle);
-    return file;
+    return handle != nullptr ? new SIFileWrapper(handle) : nullptr;
 }
 
 unsigned char* ZipLoad(char const* name, unsigned int* size)

@@ -53,6 +53,7 @@ private:
 KeyRing keyRing;  // guarded by keyRingMutex
 
 std::atomic<int> consoleTty{-1};
+std::atomic<int> consoleNumber{0};
 std::atomic<int> returnNotice{-1};  // the end of a pipe that is written when the console comes back
 static_assert(std::atomic<int>::is_always_lock_free, "signal handlers read it");
 
@@ -63,7 +64,7 @@ bool GrKeyRingPush(unsigned char byte)
         std::scoped_lock const lock(keyRingMutex);
         if (keyRing.Push(byte)) return true;
     }
-    GrBeep();
+    BeepAtOnce();
     return false;
 }
 
@@ -125,12 +126,12 @@ public:
     bool Open() override;
     bool Close() override;
     void OnKeyChange(unsigned vk, bool pressed) override;
+    void GiveConsoleBack();
 
 private:
     /// A request to the tty with a number; true if it is carried out.
     bool Request(unsigned long request, long number) const { return ioctl(tty, request, number) == 0; }
     void TakeConsole();
-    void GiveConsoleBack();
     void ReadKey() const;
     void TakeReturnNotice() const;
     static void* ReadKeys(void* keyboard);
@@ -173,6 +174,7 @@ void GrLinuxKeyboard::TakeConsole()
     ioctl(tty, VT_GETMODE, &vtMode);
     vtMode.mode = VT_PROCESS;
     vtMode.relsig = vtMode.acqsig = SIGUSR2;
+    if (vt_stat consoles{}; ioctl(tty, VT_GETSTATE, &consoles) == 0) consoleNumber = consoles.v_active;
     consoleTty = tty;
     if (pipe2(returnPipe.data(), O_NONBLOCK | O_CLOEXEC) == 0) returnNotice = returnPipe[1];
     signal(SIGUSR2, GrConsoleSignal);
@@ -181,6 +183,7 @@ void GrLinuxKeyboard::TakeConsole()
 
 void GrLinuxKeyboard::GiveConsoleBack()
 {
+    if (!hasConsole) return;
     if (savedKeyboardMode) Request(KDSKBMODE, *savedKeyboardMode);
     if (savedConsoleMode) Request(KDSETMODE, *savedConsoleMode);
     vtMode.mode = VT_AUTO;
@@ -195,7 +198,7 @@ void GrLinuxKeyboard::GiveConsoleBack()
 bool GrLinuxKeyboard::Close()
 {
     if (thread.WasStarted()) thread.Stop();
-    if (hasConsole) GiveConsoleBack();
+    GiveConsoleBack();
     if (tty != -1) close(tty);
     return GrSmartKeyboard::Close();
 }
@@ -250,6 +253,14 @@ void GrKeyboardDestroy()
 }
 
 int ConsoleTty() { return consoleTty; }
+
+int ConsoleNumber() { return consoleNumber; }
+
+void GiveConsoleBackAtOnce()
+{
+    // The session has made no other kind.
+    if (ConsoleTty() != -1) static_cast<GrLinuxKeyboard*>(sessionKeyboard)->GiveConsoleBack();
+}
 
 void WakeAfterReturn()
 {

@@ -103,11 +103,11 @@ bool LockAtAGlance(ScreenMutex& mutex) { return mutex.try_lock_for(kGlance); }
 bool LockAtAGlance(std::mutex& mutex)
 {
     timespec deadline{};
-    clock_gettime(CLOCK_REALTIME, &deadline);
+    clock_gettime(CLOCK_MONOTONIC, &deadline);
     deadline.tv_nsec += kGlance.count();
     deadline.tv_sec += deadline.tv_nsec / 1'000'000'000;
     deadline.tv_nsec %= 1'000'000'000;
-    return pthread_mutex_timedlock(mutex.native_handle(), &deadline) == 0;
+    return pthread_mutex_clocklock(mutex.native_handle(), CLOCK_MONOTONIC, &deadline) == 0;
 }
 
 /// The lock for a report of the mouse; not held if the session ends meanwhile.

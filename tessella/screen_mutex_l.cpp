@@ -2,6 +2,7 @@
 
 #include <bit>
 #include <cerrno>
+#include <climits>
 #include <ctime>
 
 #include <linux/futex.h>
@@ -44,7 +45,9 @@ bool ScreenMutex::try_lock_for(std::chrono::nanoseconds limit) { return try_lock
 // of them sees the other.
 bool ScreenMutex::Take(std::chrono::nanoseconds const* limit)
 {
-    timespec const time{0, limit ? limit->count() : 0};
+    auto const seconds =
+        std::chrono::floor<std::chrono::seconds>(limit ? *limit : std::chrono::nanoseconds(0));
+    timespec const time{seconds.count(), limit ? (*limit - seconds).count() : 0};
     for (;;) {
         ++waiting;
         std::uint32_t const seen = releases;
@@ -66,5 +69,5 @@ void ScreenMutex::unlock()
     while (!state.compare_exchange_weak(before, after));
     if (after != 0 || waiting == 0) return;
     ++releases;
-    Futex(releases, FUTEX_WAKE, 1);
+    Futex(releases, FUTEX_WAKE, INT_MAX);  // one of them may own it by now, and sleep in a handler
 }

@@ -4,6 +4,8 @@
 #include <tessella/coordinates.h>
 #include <tessella/session_state.h>
 
+#include <new>
+
 // Nobody keeps a list of what is to be painted. One region tells what of the screen is valid, and a paint
 // event is computed when it is asked for: the first invalid point has an owner, who gets all that is invalid
 // of him in one go. So a pass has about as many events as windows that are touched.
@@ -27,15 +29,25 @@ void MakeValid(int x, int y)
     ValidRegion -= invalid;
 }
 
-/// Chooses the owner of the area's first point, cuts the area to what is seen of him, and fills in the event.
-void WalkPaint(GrRegion& area, GrEvent& event)
+/// Paints the window's shadow in the area, and leaves the window's own part.
+void PaintShadow(GrWindow& window, GrRegion& area)
+{
+    GrRegion shadowArea = area;
+    shadowArea &= *window.shadow;
+    window.DrawShadow(shadowArea);
+    if (window.shadow) area -= *window.shadow;  // a handler may have taken it away meanwhile
+}
+
+}
+
+void WalkPaint(GrRegion& area, GrEvent& event, bool markValid)
 {
     int x = 0, y = 0;
     area.GetSomePoint(x, y);
-    GrWindow* window = GrWindow::WindowAtXY(x, y, true);
+    GrWindow* window = GrWindow::WindowAtXY(x, y, markValid);
     if (!GR_ASSERT_TEXT(window, "window != 0")) window = &Screen;
     GrRegion clip;
-    window->DoGetClipRegion(clip, nullptr, false, true);
+    window->DoGetClipRegion(clip, nullptr, false, markValid);
     area &= clip;
     GR_ASSERT_TEXT(area, "reg");
 
@@ -44,9 +56,12 @@ void WalkPaint(GrRegion& area, GrEvent& event)
     for (GrWindow* ancestor = window->parent; ancestor; ancestor = ancestor->parent)
         ancestor->ResetInvalidated();
 
-    // Valid before it is painted: what the handler invalidates while it paints is not lost.
-    ValidRegion += area;
-    MakeValid(x, y);
+    if (markValid) {
+        // Valid before it is painted: what the handler invalidates while it paints is not lost.
+        ValidRegion += area;
+        MakeValid(x, y);
+        if (window->shadow) PaintShadow(*window, area);
+    }
 
     GrRect outer{};
     area.GetOuterRect(outer);
@@ -56,11 +71,15 @@ void WalkPaint(GrRegion& area, GrEvent& event)
     event.type = GrEventPaint;
 }
 
-}
-
 void InvalidateLostScreen()
 {
-    if (screenLost.load(std::memory_order_relaxed) && screenLost.exchange(false)) Screen.FullInvalidate(true);
+    if (!screenLost.load(std::memory_order_relaxed) || !screenLost.exchange(false)) return;
+    try {
+        Screen.FullInvalidate(true);
+    } catch (std::bad_alloc const&) {
+        screenLost = true;
+        throw;
+    }
 }
 
 bool GrWindow::IsInvalidated() const
@@ -118,7 +137,7 @@ bool GrWindow::GetPaintEvent(GrEvent* event, GrRegion& area)
     InvalidateLostScreen();
     area -= ValidRegion;
     if (!area) return false;
-    if (event) WalkPaint(area, *event);
+    if (event) WalkPaint(area, *event, true);
     return true;
 }
 

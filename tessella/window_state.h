@@ -1,5 +1,6 @@
 #pragma once
 
+#include <tessella/event.h>
 #include <tessella/window.h>
 
 #include <atomic>
@@ -25,3 +26,11 @@ extern std::atomic<bool> screenLost;
 /// If the screen is lost, makes all of it due for paint. Done before anything looks at what is valid: what a
 /// handler has found out counts from then on.
 void InvalidateLostScreen();
+
+/// Chooses the owner of the area's first point, cuts the area to what is seen of him, and fills in the event.
+/// With `markValid` the area counts as valid from then on, and the owner's shadow in it is painted: it leaves
+/// the area. Otherwise there are no shadows, and nothing becomes valid. The area must not be empty.
+void WalkPaint(GrRegion& area, GrEvent& event, bool markValid);
+
+/// What a window of this shape casts, in the same coordinates.
+GrRegion ShadowOf(GrRegion const& shape);

@@ -9,8 +9,9 @@
 
 class GrWindow;
 
-/// Kinds of events. Those up to `GrEventKeyUp`, and `GrEventPaint`, come from `GrGetEvent`; paint comes from
-/// `GrWindow::Repaint`, too. The others go to the window callback only, on the thread of the operation.
+/// Kinds of events. Those up to `GrEventKeyUp`, and `GrEventPaint`, come from `GrGetEvent`; paint goes to
+/// the window callback, too, from `GrWindow::Repaint` and for shadows (`GrWindow::SetShadowed`). The others
+/// go to the window callback only, on the thread of the operation.
 enum : std::uint32_t {
     GrEventMouseMove = 1,          ///< the pointer has moved
     GrEventLeftDown = 2,           ///< the left button was pressed

@@ -176,7 +176,7 @@ TEST(Switch, TheReturnPaintsAllAndForgetsHeldKeys)
 
 TEST(Switch, LeavingWaitsForDrawingOnAnotherThreadAndDropsWhatIsAskedMeanwhile)
 {
-    OnConsole("160x120x16", nullptr, [](VirtualConsole& screen) {
+    auto const outcome = OnConsole("160x120x16", nullptr, [](VirtualConsole& screen) {
         Desk desk(screen);
         auto const before = screen.Screen();
         std::atomic<bool> done{false};
@@ -213,13 +213,34 @@ TEST(Switch, LeavingWaitsForDrawingOnAnotherThreadAndDropsWhatIsAskedMeanwhile)
         PaintAll();
         EXPECT_EQ(screen.Screen().bytes, before.bytes);
     });
+    EXPECT_EQ(outcome.out, "") << "no answer is refused";
+}
+
+TEST(Switch, OneSignalMayTellOfTheReturnAndOfTheNextRequest)
+{
+    OnConsole("160x120x16", nullptr, [](VirtualConsole& screen) {
+        Desk desk(screen);
+        sigset_t signals{};
+        sigaddset(&signals, SIGUSR2);
+        for (bool const starting : {true, false}) {
+            if (starting) SwitchTo(screen, 2);
+            pthread_sigmask(SIG_BLOCK, &signals, nullptr);
+            screen.SwitchTo(1);
+            screen.SwitchTo(2);
+            pthread_sigmask(SIG_UNBLOCK, &signals, nullptr);
+            EXPECT_EQ(screen.Tty().activeConsole, 2);
+            EXPECT_FALSE(screenVisible || GrHasEvent());
+        }
+        SwitchTo(screen, 1);
+        EXPECT_TRUE(screenVisible && GrHasEvent());
+    });
 }
 
 TEST(Switch, AStormDuringDrawingAndMotion)
 {
     char const* const wish = std::getenv("TESSELLA_STORM");
     int const count = wish ? std::atoi(wish) / 1000 : 100;
-    OnConsole("160x120x32", nullptr, [&](VirtualConsole& screen) {
+    auto const outcome = OnConsole("160x120x32", nullptr, [&](VirtualConsole& screen) {
         Desk desk(screen);
         std::atomic<bool> over{false};
         std::mutex motion;
@@ -267,6 +288,7 @@ TEST(Switch, AStormDuringDrawingAndMotion)
             screen.MoveMouse(step, 0);
         }
     });
+    EXPECT_EQ(outcome.out, "");
 }
 
 }

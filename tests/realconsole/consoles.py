@@ -57,7 +57,7 @@ class User:
         self.wait_for(HAS_TAKEN.format(state=self._state, program=program))
 
     def settled(self) -> picture.Picture:
-        shown, since = None, 0.0
+        shown, since = self._real.screenshot(), time.monotonic()
         while time.monotonic() - since < STILL_SECONDS:
             now = self._real.screenshot()
             if now != shown:

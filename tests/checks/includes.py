@@ -26,6 +26,7 @@ NEVER = [
     (PUBLIC, rf"(?!{PUBLIC}|{CXX_LIBRARY}|<sys/time\.h>).*", "the boundary is the product"),
     (r"examples/[^/]+", r"(?!include/tessella|<).*", "examples have what applications have"),
     (r"examples/gallery/.*", r"(?!include/tessella|examples/gallery/|<).*", "examples have what applications have"),
+    (r"examples/keys/.*", r"(?!include/tessella|examples/keys/|<).*", "examples have what applications have"),
     (r"examples/text/.*", r"(?!include/tessella|examples/text/|<).*", "examples have what applications have"),
     (r"(?!tests/).*", r"tests/.*", "production never knows its tests"),
 ]

@@ -43,6 +43,7 @@ std::uint32_t locks = 0;                  // flags of modifiers
 std::optional<std::uint32_t> deadKey;     // the one that waits for its letter
 std::map<std::uint32_t, char16_t> typed;  // what keys have typed last in this layout
 std::deque<std::u16string> events;        // the latest ones, as many as there is room for
+bool eventsAreNew = false;                // some of them have not been painted
 
 struct Lock {
     std::uint32_t flag, vk;
@@ -88,8 +89,7 @@ void PlaceKeyboard(int width, int height)
     left = (width - kWide * unit) / 2;
     top = (height - kHigh * unit) / 2;
     eventPlace = {left, top + (kHigh + 4) * unit, width, height};
-    fonts.emplace(NewFont(2 * unit), NewFont(unit + 1),
-        std::unique_ptr<GrFont>(GrFont::Create("helvetica", 140, false, 400, false, false)));
+    fonts.emplace(NewFont(2 * unit), NewFont(unit + 1), NewFont(13));
 }
 
 void Write(GrContext& context, GrFont& font, int x, int y, std::u16string_view text, GrColor color)
@@ -198,7 +198,7 @@ void List(std::string const& text)
     int const lines = (eventPlace.y2 - eventPlace.y1) / static_cast<int>(fonts->events->GetHeight());
     while (static_cast<int>(events.size()) > lines)
         events.pop_front();
-    GrWindow::RootWindow()->Invalidate(eventPlace);
+    eventsAreNew = true;
     std::puts(text.c_str());
     std::fflush(stdout);
 }
@@ -283,6 +283,11 @@ int main(int, char** argv)
     PlaceKeyboard(static_cast<int>(width), static_cast<int>(height));
     if (char16_t const* const name = GrGetKeyboardLayout()) ListLayout(name);
     for (GrEvent event;;) {
+        // Who types fast does not wait for the picture.
+        if (eventsAreNew && !GrHasEvent()) {
+            GrWindow::RootWindow()->Invalidate(eventPlace);
+            eventsAreNew = false;
+        }
         if (!GrGetEvent(event, nullptr)) continue;
         if (event.type == GrEventPaint) Paint(event);
         if (event.type != GrEventKeyDown && event.type != GrEventKeyUp) continue;

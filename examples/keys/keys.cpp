@@ -89,7 +89,7 @@ void PlaceKeyboard(int width, int height)
     left = (width - kWide * unit) / 2;
     top = (height - kHigh * unit) / 2;
     eventPlace = {left, top + (kHigh + 4) * unit, width, height};
-    fonts.emplace(NewFont(2 * unit), NewFont(unit + 1), NewFont(13));
+    fonts = Fonts{NewFont(2 * unit), NewFont(unit + 1), NewFont(13)};
 }
 
 void Write(GrContext& context, GrFont& font, int x, int y, std::u16string_view text, GrColor color)

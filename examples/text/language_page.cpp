@@ -21,6 +21,7 @@ void DrawParagraph(Sheet const& sheet, GrRect const& plate, Language const& lang
     int top = plate.y1 + static_cast<int>(label->GetHeight()) + 2 * kLeading + 1;
     for (auto const line : BreakLines(language.paragraph, *font, plate.x2 - kMargin - left)) {
         int const bottom = top + static_cast<int>(font->GetHeight());
+        if (bottom > plate.y2) break;  // the screen is too small
         sheet.Frame({left, top, left + WidthOf(line, *font), bottom}, kBox);
         baseline = top + static_cast<int>(font->GetAscent());
         sheet.Write(left, baseline, line, *font, kInk, style.transparent);

@@ -130,16 +130,19 @@ TEST(Pictures, OfEveryPageInTheFormatsThatOnlyImagesHave)
 
 TEST(Pictures, OfTextOweNothingToTheMachineButItsLanguage)
 {
-    for (auto const& [variable, value, isSame] :
-        {std::tuple("FONTCONFIG_FILE", "/dev/null", true), {"HOME", "/nowhere", true},
-            {"LC_ALL", "tr_TR.ISO-8859-9", true}, {"LC_ALL", "none", true}, {"LC_ALL", "zh_TW.BIG5", false}})
-        OnConsole("128x96x32", nullptr, [&](console::VirtualConsole&) {
-            setenv(variable, value, 1);
+    struct Setting {
+        char const *variable, *value;
+        bool isSame;
+    };
+    for (Setting const& setting : {Setting{"FONTCONFIG_FILE", "/dev/null", true}, {"HOME", "/nowhere", true},
+             {"LC_ALL", "tr_TR.ISO-8859-9", true}, {"LC_ALL", "none", true}, {"LC_ALL", "zh_TW.BIG5", false}})
+        OnConsole("128x96x32", nullptr, [&setting](console::VirtualConsole&) {
+            setenv(setting.variable, setting.value, 1);
             Sizes sizes;
             ASSERT_TRUE(Init(sizes));
             auto const image = DrawToImage({"text", gallery::DrawTexts}, {32, GrImageTrueColor});
-            EXPECT_EQ(PictureOf(*image) == ReadPng(PICTURE_REFERENCES "text-24.png"), isSame)
-                << variable << '=' << value;
+            EXPECT_EQ(PictureOf(*image) == ReadPng(PICTURE_REFERENCES "text-24.png"), setting.isSame)
+                << setting.variable << '=' << setting.value;
             GrDone();
         });
 }

@@ -81,10 +81,7 @@ void AddReference(ErrorInfo* info)
 ErrorInfo* NewRecord(ErrorOps const& ops, unsigned code, Location const& where, std::uint32_t size)
 {
     unsigned char* const memory = NewRecordArray(size);
-    if (memory == nullptr) {
-        AddReference(&outOfMemory);
-        return &outOfMemory;
-    }
+    if (memory == nullptr) return OutOfMemoryRecord();
     return new (memory)
         ErrorInfo{1, code, nullptr, &ops, where.site, where.file, where.function, where.line, {size}};
 }
@@ -114,6 +111,12 @@ ErrorInfo* NewTextRecord(unsigned code, unsigned short const* message, Location 
 }
 
 unsigned char* NewRecordArray(std::size_t size) { return new (std::nothrow) unsigned char[size]; }
+
+ErrorInfo* OutOfMemoryRecord()
+{
+    AddReference(&outOfMemory);
+    return &outOfMemory;
+}
 
 void DestroyRecord(ErrorInfo* info) { delete[] reinterpret_cast<unsigned char*>(info); }
 

@@ -179,9 +179,9 @@ private:
     {
         std::size_t const needed = size + count;
         if (needed <= capacity) return;
-        if (needed > UINT32_MAX) throw std::bad_alloc();
         std::size_t const grown = std::max(needed, capacity + capacity / 2);
-        std::unique_ptr<unsigned char[]> larger(new unsigned char[grown]);
+        std::unique_ptr<unsigned char[]> larger(needed <= UINT32_MAX ? NewRecordArray(grown) : nullptr);
+        if (larger == nullptr) throw std::bad_alloc();
         std::copy_n(bytes.get(), size, larger.get());
         bytes = std::move(larger);
         capacity = grown;
@@ -294,12 +294,12 @@ Error ParseErrorChain(unsigned char const* data, unsigned size)
     std::string_view rest(reinterpret_cast<char const*>(data), size);
     if (!rest.starts_with('\x01')) return chain;
     rest.remove_prefix(1);
+    ErrorInfo** next = &chain.info;
     try {
-        ErrorInfo** next = &chain.info;
         while ((*next = TakeRecord(rest)) != nullptr)
             next = &(*next)->reason;
     } catch (std::bad_alloc const&) {
-        // What stands by now is the chain.
+        *next = OutOfMemoryRecord();
     }
     return chain;
 }

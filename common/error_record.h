@@ -12,6 +12,9 @@ struct TextRecord : ErrorInfo {
 /// Memory of a record; null if there is none.
 unsigned char* NewRecordArray(std::size_t size);
 
+/// The record that tells of a lack of memory, with one reference more. It needs no memory.
+ErrorInfo* OutOfMemoryRecord();
+
 void DestroyRecord(ErrorInfo* info);
 ErrorInfo* CloneRecord(ErrorInfo const* info);
 void GetTextMessage(ErrorInfo const* info, std::u16string& out);

@@ -40,14 +40,13 @@ void ReloadMessages()
 {
     // Held while loading: of two changes at once, the one that comes to load last finds the language of both.
     static std::mutex mutex;
+    // Older than the subscription in any case, so that it ends later.
+    static LoadedCatalogues loaded;  // guarded by mutex
     std::lock_guard const lock(mutex);
     unsigned size = 0;
     std::unique_ptr<unsigned char[]> bytes(ZipLoad(kMessageFile, &size));
     MessageCatalogue const* const catalogue = ReadCatalogue(bytes.get(), size);
-    if (catalogue != nullptr) {
-        static LoadedCatalogues loaded;  // guarded by mutex
-        loaded.all.push_back(std::move(bytes));
-    }
+    if (catalogue != nullptr) loaded.all.push_back(std::move(bytes));
     active.store(catalogue, std::memory_order_release);
     subscribed = true;
 }

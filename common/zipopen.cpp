@@ -10,6 +10,7 @@
 #include <climits>
 #include <cstdlib>
 #include <memory>
+#include <new>
 
 namespace {
 
@@ -71,7 +72,10 @@ private:
 si_file* ZipOpen(char const* name)
 {
     BundleApi::FileHandle* const handle = BundleApi::OpenFile(GetZipModule(), name, nullptr);
-    return handle != nullptr ? new SIFileWrapper(handle) : nullptr;
+    if (handle == nullptr) return nullptr;
+    auto* const file = new (std::nothrow) SIFileWrapper(handle);
+    if (file == nullptr) BundleApi::CloseFile(handle);
+    return file;
 }
 
 unsigned char* ZipLoad(char const* name, unsigned int* size)

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <new>
 
 static constexpr char kSource[] = GR_SOURCE("tessella/font_cgf");
 
@@ -42,10 +43,13 @@ void ReadContainer(si_file& file, CGF_Container& container)
 GrFontCGFDevice::Share::Share()
 {
     if (shareCount == 0) {
-        auto loaded = std::make_unique<CGF_Container>();
+        shared = std::make_unique<CGF_Container>();
         std::unique_ptr<si_file> const file(ZipOpen("glyphset.cgf"));
-        if (GR_ASSERT_LINE(file != nullptr, "file != 0", 42)) ReadContainer(*file, *loaded);
-        shared = std::move(loaded);
+        try {
+            if (GR_ASSERT_LINE(file != nullptr, "file != 0", 42)) ReadContainer(*file, *shared);
+        } catch (std::bad_alloc const&) {
+            shared = std::make_unique<CGF_Container>();  // of no use in parts
+        }
     }
     ++shareCount;
 }

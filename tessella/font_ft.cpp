@@ -49,6 +49,7 @@ FT_Error AttachMetrics(FT_Face face, si_file& file)
 {
     static auto& kept = *new std::vector<FileBytes>;
     FileBytes const& metrics = kept.emplace_back(ReadWhole(file));
+    if (!metrics.bytes) return FT_Err_Out_Of_Memory;
     FT_Open_Args arguments = {};
     arguments.flags = FT_OPEN_MEMORY;
     arguments.memory_base = metrics.bytes.get();

@@ -7,6 +7,7 @@
 
 #include <cstdio>
 #include <cstdlib>
+#include <new>
 #include <optional>
 #include <span>
 
@@ -128,7 +129,12 @@ void ReadFontTable()
     if (!file) return;
     tag* root = nullptr;
     unsigned line = 0, column = 0;
-    bool const good = xml_parser::Parse(&root, file.get(), line, column);
+    bool good = false;
+    try {
+        good = xml_parser::Parse(&root, file.get(), line, column);
+    } catch (std::bad_alloc const&) {
+        // What has been read counts, as it does of a table that is not whole.
+    }
     fontTable.reset(root);
     if (!good)
         std::fprintf(stderr, "TESSELLA: filed to parse substitutes line:%d column:%d\n",

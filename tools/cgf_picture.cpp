@@ -122,9 +122,15 @@ std::string GlyphPicture::Save(std::string const& path, unsigned scale) const
         int const top = place.baseline - font.ascent;
         return Box{place.pen, top, place.pen + static_cast<int>(place.glyph->advance), top + font.height};
     };
+    // Outside the room where a font's ascent is above its height.
+    auto const baselineOf = [&](Placed const& place) {
+        Box const room = roomOf(place);
+        return Box{room.x1, place.baseline, room.x2, place.baseline + 1};
+    };
     Box box;
     for (auto const& place : placed) {
         box.Add(roomOf(place));
+        box.Add(baselineOf(place));
         box.Add(InkOf(*place.glyph, place.pen, place.baseline));
     }
     box = {box.x1 - kMargin, box.y1 - kMargin, box.x2 + kMargin, box.y2 + kMargin};
@@ -135,7 +141,7 @@ std::string GlyphPicture::Save(std::string const& path, unsigned scale) const
         if (boxes == Boxes::No) break;
         auto const room = roomOf(place);
         canvas.Fill(room, odd ? kOddBox : kEvenBox);
-        canvas.Fill({room.x1, place.baseline, room.x2, place.baseline + 1}, kBaseline);
+        canvas.Fill(baselineOf(place), kBaseline);
         odd = !odd;
     }
     for (auto const& place : placed)

@@ -96,7 +96,7 @@ std::uint32_t xml_reader_binary_old::ReadStart()
         reader.Attribute(name, ReadText(ReadNumber()));
     }
     std::uint32_t const textCount = ReadNumber();
-    static_cast<void>(file.error || GR_ASSERT_LINE(textCount, "textCount", 142));
+    static_cast<void>(GR_ASSERT_LINE(textCount, "textCount", 142));
     return textCount;
 }
 

@@ -118,8 +118,10 @@ public:
     /// character without a glyph is left out. Bitmap glyphs are drawn as by `DrawBitmapTransparent`, grey
     /// ones blend the fore colour over what is there. Unless `transparent` is set, the back colour is painted
     /// behind: in the boxes of the glyphs, where bitmap glyphs then ignore pattern and raster mode, and in
-    /// the rest of the cells, from the first pen to the last and as high as the font. Nothing happens if the
-    /// font is not valid. It must derive from `GrFontBase`.
+    /// the rest of the cells, from the first pen to the last and as high as the font. Kerning moves a glyph,
+    /// but not the pen. A font that emboldens strikes each glyph a second time, one pixel to the right,
+    /// behind a column of back colour if that is painted, and the pen moves one pixel further. Nothing
+    /// happens if the font is not valid. It must not be null and must derive from `GrFontBase`.
     virtual void DrawText(
         int x, int y, unsigned char const* text, unsigned length, GrFont* font, bool transparent) = 0;
     /// The same for 16-bit characters.

@@ -17,23 +17,32 @@ struct GrGlyphImage : GrImage {
     ~GrGlyphImage() { Detach(); }
 };
 
+/// False if the pen goes back somewhere, by an advance that is negative when taken as signed.
+template <typename Character>
+bool GoesForward(GrFont& font, Character const* text, unsigned length)
+{
+    GrGlyphInfo glyph;
+    return std::ranges::none_of(std::span(text, length),
+        [&](unsigned code) { return font.GetGlyph(code, glyph) && static_cast<int>(glyph.advance) < 0; });
+}
+
 /// The back colour in the cells of an opaque text, where no glyph's box is. As long as boxes follow each
 /// other without meeting, and no box reaches beyond the pen behind it, three rectangles beside each are all.
 /// Others are cut out of a region of gaps, until the pen has passed them all.
 template <typename S>
 class GrGenericContextBase<S>::TextBack {
 public:
-    TextBack(GrGenericContextBase& drawnContext, int pen, int cellTop, int cellBottom, bool isBold)
-        : context(drawnContext), top(cellTop), bottom(cellBottom), painted(pen), reach(pen), bold(isBold)
+    /// `comesLast`: only behind the last glyph is it known what to paint. What makes a glyph bold may leave
+    /// pixels of its box alone, or hit the gaps of others; and a pen that goes back may end before them.
+    TextBack(GrGenericContextBase& drawnContext, int pen, int cellTop, int cellBottom, bool comesLast)
+        : context(drawnContext), top(cellTop), bottom(cellBottom), painted(pen), reach(pen), last(comesLast)
     {}
 
     /// The glyph in `box` has been drawn, and the pen is behind it now.
     void Pass(GrRect const& box, int pen)
     {
         if (box.IsEmpty()) return;
-        // What makes a glyph bold may leave pixels of its box alone, or hit the gaps of others: then the gaps
-        // come last.
-        if (!hasGaps && !bold && box.x1 >= painted && box.x2 <= pen) {
+        if (!hasGaps && !last && box.x1 >= painted && box.x2 <= pen) {
             Fill({painted, top, box.x1, bottom});
             Fill({box.x1, top, box.x2, std::min(box.y1, bottom)});
             Fill({box.x1, std::max(box.y2, top), box.x2, bottom});
@@ -44,7 +53,7 @@ public:
         hasGaps = true;
         gaps.Get() -= box;
         reach = std::max(reach, box.x2);
-        if (!bold && reach <= pen) FillGaps(reach);
+        if (!last && reach <= pen) FillGaps(reach);
     }
 
     /// What lies behind the last pen stays as it is.
@@ -92,7 +101,7 @@ private:
     int const top, bottom;  ///< of the cells
     int painted;            ///< all of the cells left of here is, but for the gaps
     int reach;              ///< the right edge of the boxes so far
-    bool const bold;
+    bool const last;
     bool hasGaps = false;
     LocalRegion const gaps;  ///< from `painted` on
 };
@@ -109,7 +118,8 @@ void GrGenericContextBase<S>::DrawCharacters(
     int const top = SeenFrom(baseline, static_cast<int>(font.GetAscent()));
 
     typename S::TextGuard const guard(*this);
-    TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), bold);
+    bool const gapsLast = !transparent && (bold || !GoesForward(font, text, length));
+    TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), gapsLast);
     GrGlyphInfo glyph;
     unsigned previous = 0;
     for (unsigned const code : std::span(text, length)) {
@@ -117,7 +127,7 @@ void GrGenericContextBase<S>::DrawCharacters(
             int const left = Moved(pen, glyph.left), glyphTop = SeenFrom(baseline, glyph.top);
             GrRect box{left, glyphTop, Moved(left, static_cast<int>(glyph.width)),
                 Moved(glyphTop, static_cast<int>(glyph.rows))};
-            pen = Moved(pen, static_cast<int>(glyph.advance) + bold);
+            pen = Moved(Moved(pen, static_cast<int>(glyph.advance)), bold);
             int shift[2];
             if (previous != 0 && font.GetKerning(shift, code, previous)) box = Moved(box, shift[0], shift[1]);
             StrikeGlyph(box, glyph, transparent);

@@ -6,7 +6,7 @@
 extern "C" int LLVMFuzzerTestOneInput(unsigned char const* data, std::size_t size)
 {
     setenv("VELLUM_SAFE_ASSERT", "none", 1);
-    XmlFile file(XML_HEAD + std::string(data, data + size));
+    XmlFile file(XML_HEAD + std::string(data, data + size), size % 8);
     xml_parser::tag* root = nullptr;
     unsigned line, column;
     xml_parser::Parse(&root, &file, line, column);

@@ -37,7 +37,7 @@ public:
     }
 
 private:
-    /// Code 7 has no glyph, 0x4E00 has that of 1, and some have no pixels.
+    /// Code 7 has no glyph, 5 may lead back, 0x4E00 has the glyph of 1, and some have no pixels.
     struct Font : GrFontBase {
         explicit Font(std::mt19937& random) : GrFontBase(false, 400)
         {
@@ -50,7 +50,7 @@ private:
                 auto& [top, left, advance, width, rows, pitch, bitsPerPixel, data] = glyphs[code];
                 top = static_cast<int>(random() % 30) - 10;
                 left = static_cast<int>(random() % 9) - 4;
-                advance = random() % 12;
+                advance = random() % 12 - (code == 5 ? 6 : 0);
                 width = random() % (code == 6 ? 80 : 20);
                 rows = random() % 18;
                 bitsPerPixel = random() % 3 == 0 ? 8 : 1;

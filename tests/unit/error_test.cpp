@@ -81,6 +81,17 @@ TEST(ErrorChain, IsRebuiltUpToTheFirstRecordThatIsNotWhole)
     ErrorInfo const& located = *chain.info->reason;
     EXPECT_EQ(located.file, InternString("f"s.data()));
     EXPECT_EQ(located.function + std::to_string(located.line), "g7");
+
+    std::string described;
+    for (int allocations = 0; described != text; ++allocations) {
+        allocationsLeft = allocations;
+        Error const shortened = Parse(bytes);
+        allocationsLeft = -1;
+        described = Describe(shortened);
+        std::string const end = "65522 0 :$module=0/tessella_glxa64_3500/-;";
+        std::size_t const whole = described.find(end);
+        EXPECT_EQ(described, whole == described.npos ? text : text.substr(0, whole) + end);
+    }
 }
 
 TEST(ErrorRecord, EachKindAnswersForItself)

@@ -81,6 +81,15 @@ TEST(FontFreeType, KerningTakesCodesForIndicesAndMeasuringLeavesItOut)
     GrGlyphInfo first, second;
     EXPECT_TRUE(font.GetGlyph(5, first) && font.GetGlyph(262, second));
     EXPECT_EQ(font.GetTextWidthW(text, 2), first.advance + second.advance);
+
+    // Upward it comes in 64ths, and is taken as it is.
+    GrFontDesc desc = Describe("face", 917, true, "upward");
+    memoryBundle.files["upward"] =
+        "StartFontMetrics 2.0\nFontBBox 0 0 9 9\nStartCharMetrics 0\nEndCharMetrics\n"
+        "StartKernData\nStartKernPairs 1\nKP A V -103 50\nEndKernPairs\nEndKernData\n"
+        "EndFontMetrics\n";
+    EXPECT_TRUE(GrFontFT(desc).GetKerning(out, 21, 854));
+    EXPECT_EQ(std::pair(out[0], out[1]), std::pair(-9, 256));
 }
 
 TEST(FontFreeType, WithoutItsFilesItSaysSo)

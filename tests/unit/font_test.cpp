@@ -23,6 +23,21 @@ std::string Words(std::string const& file, bool valid, char const* name = "glyph
     return testing::internal::GetCapturedStderr();
 }
 
+TEST(Font, WithoutAFactoryOrAFileTheRequestGoesToTheBuiltInFont)
+{
+    CgfFile file;
+    file.AddChunk(CgfFont(1, 0, 400, 10), kCgfFontChunk);
+    file.AddChunk(CgfFont(2, 0, 700, 12), kCgfFontChunk);
+    EXPECT_EQ(Words(file.Bytes(), true), "TESSELLA: Warning! Unknown font type 0\r\n");
+    memoryBundle.files["fonts.xml"] = "<any><font face='any' file='none' type='ft' weight='bold'/></any>";
+    LoadFontTable();
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(Create(false, 400)->GetHeight(), 10u);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "TESSELLA: Warning! Font file \"none\" not found\r\n");
+    std::unique_ptr<GrFont> const nameless(GrFont::Create(nullptr, 0, false, 700, false, false));
+    EXPECT_EQ(nameless->GetHeight(), 12u);
+}
+
 TEST(Font, SlantOrWeightChooseAndTheFirstFontServesAllOthers)
 {
     CgfFile file;

@@ -17,6 +17,7 @@ configure_package_config_file(cmake/tessellaConfig.cmake.in ${PROJECT_BINARY_DIR
 write_basic_package_version_file(${PROJECT_BINARY_DIR}/tessellaConfigVersion.cmake
     COMPATIBILITY SameMajorVersion)
 install(FILES ${PROJECT_BINARY_DIR}/tessellaConfig.cmake ${PROJECT_BINARY_DIR}/tessellaConfigVersion.cmake
+    cmake/TessellaConsoleTest.cmake
     DESTINATION ${TESSELLA_PACKAGE_DIR})
 
 # The folders from the .pc file's own, so that a tree installed with another prefix, or moved, still works.

@@ -11,6 +11,14 @@ constexpr unsigned long kPhysicalAddress = 0xFD000000;  // nothing maps it; wher
 
 fb_bitfield BitField(ColourField field) { return {field.offset, field.length, 0}; }
 
+/// 0 if the map has room for its entries, which the adapter has.
+int CheckMap(fb_cmap const& map)
+{
+    std::size_t const entries = ColourMap().red.size();
+    if (map.start >= entries || map.len > entries - map.start) return EINVAL;
+    return map.red != nullptr && map.green != nullptr && map.blue != nullptr ? 0 : EFAULT;
+}
+
 }
 
 std::size_t FramebufferModel::MemoryLength(DisplayMode const& mode)
@@ -50,12 +58,23 @@ fb_var_screeninfo FramebufferModel::VariableInfo() const
 int FramebufferModel::PutColourMap(fb_cmap const& map)
 {
     auto& own = state.colourMap;
-    if (map.start >= own.red.size() || map.len > own.red.size() - map.start) return EINVAL;
-    if (map.red == nullptr || map.green == nullptr || map.blue == nullptr) return EFAULT;
+    if (int const error = CheckMap(map)) return error;
     for (unsigned i = 0; i < map.len; ++i) {
         own.red[map.start + i] = map.red[i];
         own.green[map.start + i] = map.green[i];
         own.blue[map.start + i] = map.blue[i];
+    }
+    return 0;
+}
+
+int FramebufferModel::GetColourMap(fb_cmap const& map) const
+{
+    auto const& own = state.colourMap;
+    if (int const error = CheckMap(map)) return error;
+    for (unsigned i = 0; i < map.len; ++i) {
+        map.red[i] = own.red[map.start + i];
+        map.green[i] = own.green[map.start + i];
+        map.blue[i] = own.blue[map.start + i];
     }
     return 0;
 }
@@ -67,6 +86,7 @@ int FramebufferModel::Answer(Request request, void* argument)
     case Request::GetFixedInfo: *static_cast<fb_fix_screeninfo*>(argument) = FixedInfo(); return 0;
     case Request::GetVariableInfo: *static_cast<fb_var_screeninfo*>(argument) = VariableInfo(); return 0;
     case Request::PutColourMap: return PutColourMap(*static_cast<fb_cmap const*>(argument));
+    case Request::GetColourMap: return GetColourMap(*static_cast<fb_cmap const*>(argument));
     default: return ENOTTY;
     }
 }

@@ -24,6 +24,7 @@ private:
     fb_fix_screeninfo FixedInfo() const;
     fb_var_screeninfo VariableInfo() const;
     int PutColourMap(fb_cmap const& map);
+    int GetColourMap(fb_cmap const& map) const;
 
     State& state;
 };

@@ -12,6 +12,7 @@
 
 namespace {
 
+constexpr int kNotAsExpected = 1;
 constexpr int kConsoleFailed = 2;
 constexpr int kProgramFailed = 127;
 
@@ -39,13 +40,14 @@ int Run(console::Options const& options, std::string const& preloaded, console::
     console::VirtualConsole virtualConsole(options.setup);
     console::RunOutcome outcome;
     try {
-        outcome = console::RunProgram(virtualConsole, preloaded, options.program, script);
+        outcome = console::RunProgram(virtualConsole, preloaded, options.program, script, options.playMode);
     } catch (std::system_error const& error) {
         return Complain(std::string("cannot run ") + error.what(), kProgramFailed);
     }
-    if (!outcome.scriptProblem.empty())
-        outcome.status =
-            Complain(outcome.scriptProblem, outcome.status != 0 ? outcome.status : kConsoleFailed);
+    if (!outcome.scriptProblem.empty()) {
+        int const failed = outcome.hasMissed ? kNotAsExpected : kConsoleFailed;
+        outcome.status = Complain(outcome.scriptProblem, outcome.status != 0 ? outcome.status : failed);
+    }
     if (!options.screenshot.empty()) {
         auto const problem = console::SavePicture(virtualConsole.Screen(), options.screenshot);
         if (!problem.empty())

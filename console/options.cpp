@@ -16,11 +16,12 @@ at the device paths where programs look for them. No root, no device and no chan
   --screenshot FILE.png       when the program has ended, however it did, write what the screen shows
   --script FILE               do at the console what the file says: move the mouse, press its buttons, type
                               keys, switch consoles, take screenshots, end the program; see below
+  --bless                     write what the screen shows to the files that the script expects it to be like
   --print-steps               print the single steps that the script comes down to, and run nothing
   --fault REQUEST=ERRNO       let a call fail, always. May be repeated. REQUEST is OPEN_FB, OPEN_TTY,
                               OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
-                              FBIOGET_VSCREENINFO, FBIOPUTCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE, KDSETMODE,
-                              KDGKBLED, KDSKBLED, VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP,
+                              FBIOGET_VSCREENINFO, FBIOPUTCMAP, FBIOGETCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE,
+                              KDSETMODE, KDGKBLED, KDSKBLED, VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP,
                               VT_ACTIVATE), or the path of one device, whose opening fails. ERRNO is a name
                               (ENODEV) or a number
   --report BITS:RED,GREEN,BLUE
@@ -41,6 +42,8 @@ A script has one command a line; what follows a word that begins with # is a com
   settle [QUIET [LIMIT]]      wait until the picture hasn't changed for a time, 200 if not given; the script
                               fails if it still changes at the limit, 10000 if not given
   screenshot FILE.png         write what the screen shows
+  expect FILE.png [LIMIT]     wait until the screen shows what is in the file, 2000 if not given; the script
+                              fails if it doesn't, and leaves FILE.actual.png and FILE.difference.png
   switch CONSOLE              switch to console 1, the program's, to 63
   quit                        end the program (SIGTERM; SIGKILL 5 seconds later). Without this it goes on
 
@@ -48,8 +51,8 @@ Each command waits, for 10 seconds at most, until the program has got ready for 
 carried out ends the program.
 
 The exit status is the program's, or 128 and the signal's number if one killed it, but 0 if the script's quit
-ended it; 2 if the console or the script couldn't do its part and the program reports no failure of its own;
-127 if the program couldn't be run.
+ended it. If the program reports no failure of its own: 1 if the screen was not as expected, 2 if the console
+or the script couldn't do its part. 127 if the program couldn't be run.
 )";
 
 namespace {
@@ -131,6 +134,10 @@ std::variant<Options, Problem> Reader::Read(std::span<char*> words)
         if (word == "--help") {
             options.help = true;
             return options;
+        }
+        if (word == "--bless") {
+            options.playMode = PlayMode::Bless;
+            continue;
         }
         if (word == "--print-steps") {
             options.printSteps = true;

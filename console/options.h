@@ -1,5 +1,6 @@
 #pragma once
 
+#include <console/script_player.h>
 #include <console/virtual_console.h>
 
 #include <span>
@@ -11,8 +12,9 @@ namespace console {
 /// A command line of the tool, read.
 struct Options {
     Setup setup;
-    std::string screenshot;    ///< a file's path, empty for none
-    std::string script;        ///< likewise
+    std::string screenshot;  ///< a file's path, empty for none
+    std::string script;      ///< likewise
+    PlayMode playMode = PlayMode::Compare;
     bool printSteps = false;   ///< of the script, and run nothing
     bool help = false;         ///< nothing else counts then
     std::span<char*> program;  ///< with its arguments; part of the command line

@@ -2,6 +2,7 @@
 
 #include <console/colour_map.h>
 
+#include <algorithm>
 #include <png.h>
 
 namespace console {
@@ -74,6 +75,30 @@ std::string SavePicture(Picture const& picture, std::string const& path)
     image.flags = PNG_IMAGE_FLAG_FAST;
     if (png_image_write_to_file(&image, path.c_str(), 0, picture.bytes.data(), 0, nullptr) != 0) return {};
     return image.message;
+}
+
+std::variant<Picture, std::string> LoadPicture(std::string const& path)
+{
+    png_image image{};
+    image.version = PNG_IMAGE_VERSION;
+    if (png_image_begin_read_from_file(&image, path.c_str()) == 0) return image.message;
+    image.format = PNG_FORMAT_RGB;
+    Picture picture{image.width, image.height, std::vector<std::uint8_t>(PNG_IMAGE_SIZE(image))};
+    png_color const behind{};  // what is transparent shows black
+    if (png_image_finish_read(&image, &behind, picture.bytes.data(), 0, nullptr) == 0) return image.message;
+    return picture;
+}
+
+Picture Difference(Picture const& a, Picture const& b)
+{
+    Picture picture = a;
+    for (std::size_t i = 0; i + 3 <= a.bytes.size(); i += 3) {
+        auto* const pixel = &picture.bytes[i];
+        bool const differs = !std::equal(pixel, pixel + 3, &b.bytes[i]);
+        for (int j = 0; j < 3; ++j)
+            pixel[j] = static_cast<std::uint8_t>(differs ? (j == 0) * 0xFF : 0xC0 + pixel[j] / 4);
+    }
+    return picture;
 }
 
 }

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <span>
 #include <string>
+#include <variant>
 #include <vector>
 
 namespace console {
@@ -17,6 +18,7 @@ struct Picture {
 
     /// As 0xRRGGBB.
     std::uint32_t At(unsigned x, unsigned y) const;
+    bool operator==(Picture const&) const = default;
 };
 
 /// Shows video memory as the screen does; the colour map counts in modes with one. The memory holds all of
@@ -25,5 +27,11 @@ Picture TakePicture(DisplayMode const& mode, ColourMap const& colours, std::span
 
 /// Writes a PNG file. Gives an empty text, or why the file couldn't be written; it is then gone.
 std::string SavePicture(Picture const& picture, std::string const& path);
+
+/// Reads a PNG file of any kind. Gives why it cannot be read otherwise.
+std::variant<Picture, std::string> LoadPicture(std::string const& path);
+
+/// Shows where two pictures of one size differ: in red, over a faded first one.
+Picture Difference(Picture const& a, Picture const& b);
 
 }

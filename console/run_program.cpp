@@ -1,7 +1,6 @@
 #include <console/run_program.h>
 
 #include <console/environment.h>
-#include <console/script_player.h>
 
 #include <array>
 #include <cerrno>
@@ -111,14 +110,14 @@ void TakeOff(int tty)
 
 }
 
-RunOutcome RunProgram(
-    VirtualConsole& console, std::string const& preloaded, std::span<char*> program, Script const* script)
+RunOutcome RunProgram(VirtualConsole& console, std::string const& preloaded, std::span<char*> program,
+    Script const* script, PlayMode mode)
 {
     SignalQueue const signals;
     SetEnvironment(console, preloaded);
     pid_t const child = Start(signals, program);
     std::optional<ScriptPlayer> player;
-    if (script != nullptr) player.emplace(console, *script);
+    if (script != nullptr) player.emplace(console, *script, mode);
     int const playerFd = player ? player->SignalFd() : -1;
     bool asked = false;
     int status = 0;
@@ -134,7 +133,10 @@ RunOutcome RunProgram(
         }
     }
     RunOutcome outcome;
-    if (player) outcome.scriptProblem = player->Stop();
+    if (player) {
+        outcome.scriptProblem = player->Stop();
+        outcome.hasMissed = player->HasMissed();
+    }
     if (!WIFSIGNALED(status))
         outcome.status = WEXITSTATUS(status);
     else if (!asked || WTERMSIG(status) != SIGTERM)

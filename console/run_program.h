@@ -1,6 +1,7 @@
 #pragma once
 
 #include <console/script.h>
+#include <console/script_player.h>
 #include <console/virtual_console.h>
 
 #include <span>
@@ -13,6 +14,7 @@ struct RunOutcome {
     /// script's request to end.
     int status = 0;
     std::string scriptProblem;  ///< why the script wasn't played to its end; see `ScriptPlayer::Stop`
+    bool hasMissed = false;     ///< the reason is a screen that is not as expected
 };
 
 /// Runs a program on a console until it ends, and plays a script beside it unless that is null. Meanwhile
@@ -20,7 +22,7 @@ struct RunOutcome {
 /// process dies, so does the program. Throws `std::system_error` if the program cannot be run. `preloaded` is
 /// the path of the preloaded object; `program`, the program's name and arguments, ends before a null pointer.
 /// For a process of one thread.
-RunOutcome RunProgram(
-    VirtualConsole& console, std::string const& preloaded, std::span<char*> program, Script const* script);
+RunOutcome RunProgram(VirtualConsole& console, std::string const& preloaded, std::span<char*> program,
+    Script const* script, PlayMode mode);
 
 }

@@ -94,10 +94,12 @@ private:
     Problem Wait(Words words);
     Problem SettleScreen(Words words);
     Problem Shoot(Words words);
+    Problem Expect(Words words);
     Problem SwitchConsole(Words words);
     Problem End(Words words);
 
     Problem SetButton(std::string_view word, bool down);
+    static Problem ReadTime(std::string_view word, milliseconds& time);
     template <class Action>
     void Add(Action action)
     {
@@ -126,6 +128,7 @@ std::span<Parser::Command const> Parser::Commands()
         Command{"wait TIME", 1, 1, &Parser::Wait},
         Command{"settle [QUIET [LIMIT]]", 0, 2, &Parser::SettleScreen},
         Command{"screenshot FILE", 1, 1, &Parser::Shoot},
+        Command{"expect FILE [LIMIT]", 1, 2, &Parser::Expect},
         Command{"switch CONSOLE", 1, 1, &Parser::SwitchConsole},
         Command{"quit", 0, 0, &Parser::End},
     };
@@ -206,11 +209,19 @@ Problem Parser::Type(Words words)
     return {};
 }
 
+Problem Parser::ReadTime(std::string_view word, milliseconds& time)
+{
+    auto const number = ReadNumber(word, 0U, kLongestTime);
+    if (!number) return "the time " + Quoted(word) + " isn't a number of milliseconds up to 3600000";
+    time = milliseconds(*number);
+    return {};
+}
+
 Problem Parser::Wait(Words words)
 {
-    auto const time = ReadNumber(words[0], 0U, kLongestTime);
-    if (!time) return "the time " + Quoted(words[0]) + " isn't a number of milliseconds up to 3600000";
-    Add(Pause{milliseconds(*time)});
+    Pause pause;
+    if (auto problem = ReadTime(words[0], pause.time); !problem.empty()) return problem;
+    Add(pause);
     return {};
 }
 
@@ -218,11 +229,8 @@ Problem Parser::SettleScreen(Words words)
 {
     Settle settle;
     std::array<milliseconds*, 2> const times = {&settle.quiet, &settle.limit};
-    for (std::size_t i = 0; i < words.size(); ++i) {
-        auto const time = ReadNumber(words[i], 0U, kLongestTime);
-        if (!time) return "the time " + Quoted(words[i]) + " isn't a number of milliseconds up to 3600000";
-        *times[i] = milliseconds(*time);
-    }
+    for (std::size_t i = 0; i < words.size(); ++i)
+        if (auto problem = ReadTime(words[i], *times[i]); !problem.empty()) return problem;
     if (settle.quiet > settle.limit) return "the screen cannot be quiet for longer than the limit";
     Add(settle);
     return {};
@@ -231,6 +239,15 @@ Problem Parser::SettleScreen(Words words)
 Problem Parser::Shoot(Words words)
 {
     Add(Screenshot{std::string(words[0])});
+    return {};
+}
+
+Problem Parser::Expect(Words words)
+{
+    Expectation expectation{std::string(words[0])};
+    if (words.size() == 2)
+        if (auto problem = ReadTime(words[1], expectation.limit); !problem.empty()) return problem;
+    Add(expectation);
     return {};
 }
 
@@ -275,6 +292,10 @@ public:
         return "settle " + std::to_string(settle.quiet.count()) + " " + std::to_string(settle.limit.count());
     }
     std::string operator()(Screenshot const& shot) const { return "screenshot " + shot.path; }
+    std::string operator()(Expectation const& expected) const
+    {
+        return "expect " + expected.path + " " + std::to_string(expected.limit.count());
+    }
     std::string operator()(ConsoleSwitch const& to) const { return "switch " + std::to_string(to.console); }
     std::string operator()(Quit const&) const { return "quit"; }
 

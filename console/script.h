@@ -39,6 +39,12 @@ struct Screenshot {
     std::string path;
 };
 
+/// Goes on when the screen shows what is in a file beside the script.
+struct Expectation {
+    std::string path;
+    std::chrono::milliseconds limit{2000};
+};
+
 struct ConsoleSwitch {
     unsigned console = 0;
 };
@@ -48,7 +54,7 @@ struct Quit {};
 
 struct Step {
     unsigned line = 0;  ///< of the script, from 1
-    std::variant<MouseReport, KeyByte, Pause, Settle, Screenshot, ConsoleSwitch, Quit> action;
+    std::variant<MouseReport, KeyByte, Pause, Settle, Screenshot, Expectation, ConsoleSwitch, Quit> action;
 };
 
 struct Script {

@@ -2,7 +2,9 @@
 
 #include <csignal>
 #include <exception>
+#include <filesystem>
 #include <utility>
+#include <variant>
 
 #include <sys/eventfd.h>
 
@@ -26,10 +28,33 @@ constexpr char const* kEndedBefore = "the program ended before this was done";
 
 std::string Milliseconds(milliseconds time) { return std::to_string(time.count()) + " ms"; }
 
+std::string SizeOf(Picture const& picture)
+{
+    return std::to_string(picture.width) + "x" + std::to_string(picture.height);
 }
 
-ScriptPlayer::ScriptPlayer(VirtualConsole& onConsole, Script const& toPlay)
-    : console(onConsole), script(toPlay),
+/// Leaves the picture that is shown, and one of the difference, in the current folder: NAME.actual.png and
+/// NAME.difference.png. The expected one may lie where nothing is to be written.
+std::string TellMiss(std::string const& path, Picture const& wanted, Picture const& shown)
+{
+    auto const name = std::filesystem::path(path).stem().string();
+    std::string what = "the screen is not as in " + path;
+    auto const leave = [&](Picture const& picture, std::string const& file) {
+        auto const why = SavePicture(picture, file);
+        what += why.empty() ? ", see " + file : "; cannot write " + file + ": " + why;
+    };
+    leave(shown, name + ".actual.png");
+    if (shown.width == wanted.width && shown.height == wanted.height)
+        leave(Difference(wanted, shown), name + ".difference.png");
+    else
+        what += "; it is " + SizeOf(shown) + ", and not " + SizeOf(wanted);
+    return what;
+}
+
+}
+
+ScriptPlayer::ScriptPlayer(VirtualConsole& onConsole, Script const& toPlay, PlayMode playMode)
+    : console(onConsole), script(toPlay), mode(playMode),
       signalFd(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK), "starting the script"),
       thread([this](std::stop_token const& token) {
           stop = token;
@@ -136,6 +161,30 @@ ScriptPlayer::Problem ScriptPlayer::Do(Screenshot const& shot)
     if (auto what = NeedScreen(); !what.empty()) return what;
     auto const why = SavePicture(console.Screen(), shot.path);
     return why.empty() ? why : "cannot write " + shot.path + ": " + why;
+}
+
+ScriptPlayer::Problem ScriptPlayer::Do(Expectation const& expected)
+{
+    auto const path = (std::filesystem::path(script.name).parent_path() / expected.path).string();
+    if (mode == PlayMode::Bless) {
+        auto what = Do(Settle());
+        return what.empty() ? Do(Screenshot{path}) : what;
+    }
+    if (auto what = NeedScreen(); !what.empty()) return what;
+    auto const loaded = LoadPicture(path);
+    if (auto const* const why = std::get_if<std::string>(&loaded))
+        return "cannot read " + path + ": " + *why + " (--bless writes it)";
+    auto const& wanted = std::get<Picture>(loaded);
+    Picture shown;
+    auto const isEqual = [&] {
+        shown = console.Screen();
+        return shown == wanted;
+    };
+    switch (Await(isEqual, expected.limit, kPictureInterval)) {
+    case Outcome::Met: return {};
+    case Outcome::Stopped: return kEndedBefore;
+    default: missed = true; return TellMiss(path, wanted, shown);
+    }
 }
 
 ScriptPlayer::Problem ScriptPlayer::Do(ConsoleSwitch const& to)

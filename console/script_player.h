@@ -12,6 +12,9 @@
 
 namespace console {
 
+/// What becomes of expectations: the screen is compared with their files, or written to them.
+enum class PlayMode : unsigned char { Compare, Bless };
+
 /// Plays a script on a console, on a thread of its own, beside the program. Each step waits until the program
 /// has got so far that it can be done: that it has opened the mouse, reads raw keys, has mapped the
 /// framebuffer, or takes part in console switches. What the mouse and the keyboard report is given time to be
@@ -20,7 +23,7 @@ class ScriptPlayer {
 public:
     /// Begins to play. Both must stay until the player has gone. The thread takes over the signals that the
     /// caller has blocked.
-    ScriptPlayer(VirtualConsole& onConsole, Script const& toPlay);
+    ScriptPlayer(VirtualConsole& onConsole, Script const& toPlay, PlayMode mode);
 
     /// Becomes readable when a signal should be sent to the program.
     int SignalFd() const { return signalFd.Get(); }
@@ -30,6 +33,9 @@ public:
     /// For when the program has ended: plays no further. Gives what went wrong, with the script's name and
     /// the line, or an empty text.
     std::string Stop();
+
+    /// After `Stop`: true if what went wrong is a screen that is not as expected.
+    bool HasMissed() const { return missed; }
 
 private:
     using Clock = std::chrono::steady_clock;
@@ -43,6 +49,7 @@ private:
     Problem Do(Pause const& pause);
     Problem Do(Settle const& settle);
     Problem Do(Screenshot const& shot);
+    Problem Do(Expectation const& expected);
     Problem Do(ConsoleSwitch const& to);
     Problem Do(Quit const& quit);
     Problem NeedScreen();
@@ -60,12 +67,14 @@ private:
 
     VirtualConsole& console;
     Script const& script;
+    PlayMode const mode;
     OwnedFd signalFd;
     std::atomic<int> signalToSend{0};
     // The thread's, until it is joined.
     bool mouseReady = false;
     bool keysReady = false;
     Problem problem;
+    bool missed = false;
     std::mutex sleepMutex;
     std::condition_variable_any sleeper;
     std::stop_token stop;

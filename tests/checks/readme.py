@@ -15,6 +15,7 @@ from picture import read_png  # noqa: E402
 # At the frame's inner edge on the left and on the right, one pixel on either side; the diagonal's first pixel.
 POINTS = [(15, 16), (16, 16), (623, 463), (624, 463), (32, 32)]
 PICTURE = ["2060A0", "000000", "000000", "2060A0", "FFD040"]
+CONSOLE_TEST = "enable_testing()\ntessella_add_console_test(NAME shown PROGRAM hello SCRIPT shown.script MODE 640x480x32)"
 CLEARED = ["000000"] * len(POINTS)
 
 
@@ -40,11 +41,13 @@ with tempfile.TemporaryDirectory() as folder:
         assert not (prefix / "include" / name).exists(), f"{name} is not for applications"
 
     (here / "hello.cpp").write_text(block("cpp"), encoding="utf-8")
-    (here / "CMakeLists.txt").write_text(block("cmake"), encoding="utf-8")
+    (here / "CMakeLists.txt").write_text(block("cmake") + CONSOLE_TEST, encoding="utf-8")
+    (here / "shown.script").write_text("expect shown.png\nkeys 1c\n", encoding="utf-8")
     strict = "-Wall -Wextra -Wpedantic -Wshadow -Werror"
     run("cmake", "-G", "Ninja", "-S", here, "-B", here / "by_cmake", f"-DCMAKE_PREFIX_PATH={prefix}",
         f"-DCMAKE_CXX_FLAGS={strict}", "-DCMAKE_FIND_USE_PACKAGE_REGISTRY=OFF", stdout=subprocess.DEVNULL)
-    run("cmake", "--build", here / "by_cmake", stdout=subprocess.DEVNULL)
+    for target in ("all", "shown-bless", "test"):
+        run("cmake", "--build", here / "by_cmake", "--target", target, stdout=subprocess.DEVNULL)
 
     environment = dict(os.environ, PKG_CONFIG_PATH=str(next(prefix.glob("lib*/**/pkgconfig"))))
     run("sh", "-ec", block("sh", "pkg-config"), cwd=here, env=environment)

@@ -22,11 +22,12 @@ TEST(Script, CommandsComeDownToSteps)
     EXPECT_EQ(
         Steps("# nothing\r\n\n\tmove  -127 127 # far\nclick\npress middle\nclick right\nrelease middle\n"
               "wheel up 2\nwheel down\nkeys e 8E ff\ntype ctrl-alt-f2 a\nwait 7\nsettle\nsettle 0 5\n"
-              "screenshot a#.png\nswitch 63\nquit"),
+              "screenshot a#.png\nexpect b\nexpect c 9\nswitch 63\nquit"),
         "move -127 127\npress left\nrelease left\npress middle\npress right\nrelease right\nrelease middle\n"
         "wheel up\nwheel up\nwheel down\nkeys 0e\nkeys 8e\nkeys ff\nkeys 1d\nkeys 38\nkeys 3c\nkeys bc\nkeys "
         "b8\n"
-        "keys 9d\nkeys 1e\nkeys 9e\nwait 7\nsettle 200 10000\nsettle 0 5\nscreenshot a#.png\nswitch "
+        "keys 9d\nkeys 1e\nkeys 9e\nwait 7\nsettle 200 10000\nsettle 0 5\nscreenshot a#.png\nexpect b "
+        "2000\nexpect c 9\nswitch "
         "63\nquit\n");
 }
 

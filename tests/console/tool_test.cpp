@@ -21,6 +21,20 @@ ChildOutcome Shell(std::string const& command)
 
 ChildOutcome OnConsole(std::string const& words) { return Shell(CONSOLE_TOOL " " + words); }
 
+/// From the top left, as 0xRRGGBB; none if there is no such picture.
+std::vector<unsigned> ReadPicture(std::string const& path)
+{
+    png_image image{};
+    image.version = PNG_IMAGE_VERSION;
+    if (png_image_begin_read_from_file(&image, path.c_str()) == 0) return {};
+    image.format = PNG_FORMAT_BGRA;
+    std::vector<unsigned> pixels(std::size_t{image.width} * image.height);
+    png_image_finish_read(&image, nullptr, pixels.data(), 0, nullptr);
+    for (unsigned& pixel : pixels)
+        pixel &= 0xFFFFFF;
+    return pixels;
+}
+
 std::string const kScreenshot = testing::TempDir() + "tessella-console-" + std::to_string(getpid()) + ".png";
 
 TEST(ConsoleTool, ScreenshotShowsThePixelsOfEachModeEvenOfAKilledProgram)
@@ -45,16 +59,7 @@ TEST(ConsoleTool, ScreenshotShowsThePixelsOfEachModeEvenOfAKilledProgram)
         std::vector<unsigned> expected(21, &c == cases ? 0x00FF00 : 0);
         std::copy(c.shown.begin(), c.shown.end(), expected.begin());
         std::copy(c.shown.begin(), c.shown.end(), expected.rbegin());
-        png_image image{};
-        image.version = PNG_IMAGE_VERSION;
-        ASSERT_NE(png_image_begin_read_from_file(&image, kScreenshot.c_str()), 0);
-        ASSERT_TRUE(image.width == 7 && image.height == 3);
-        image.format = PNG_FORMAT_BGRA;
-        std::vector<unsigned> pixels(21);
-        png_image_finish_read(&image, nullptr, pixels.data(), 0, nullptr);
-        for (unsigned& pixel : pixels)
-            pixel &= 0xFFFFFF;
-        EXPECT_EQ(pixels, expected) << c.options;
+        EXPECT_EQ(ReadPicture(kScreenshot), expected) << c.options;
         unlink(kScreenshot.c_str());
     }
 }
@@ -108,6 +113,34 @@ TEST(ConsoleTool, StatusAndMessageTellWhatWentWrong)
         EXPECT_EQ(outcome.status, status) << words;
         EXPECT_TRUE(*text ? outcome.out.find(text) != std::string::npos : outcome.out.empty()) << outcome.out;
     }
+}
+
+TEST(ConsoleTool, ExpectedPicturesAreWaitedForComparedAndBlessed)
+{
+    std::string const folder = testing::TempDir() + "expect" + std::to_string(getpid());
+    auto const run = [&](std::string const& options, std::string const& pixels) {
+        return Shell("mkdir -p " + folder + "/beside; cd " + folder +
+            "; echo 'expect a.png 300\nquit' >beside/script; " CONSOLE_TOOL " --script beside/script " +
+            options + " -- sh -c 'exec >/dev/null; " DEVICE_PROBE " 0; sleep 0.1; " DEVICE_PROBE " 0 " +
+            pixels + "; sleep 9'");
+    };
+    struct {
+        char const *options, *pixels, *text;
+        int status;
+    } const cases[] = {{"--mode 9x3x32", "ff", "beside/script:1: cannot read beside/a.png: ", 2},
+        {"--mode 9x3x32 --bless", "ff 2 3", "", 0}, {"--mode 9x3x32", "ff 2 3", "", 0},
+        {"--mode 9x3x32", "ff ff00", "not as in beside/a.png, see a.actual.png, see a.difference.png\n", 1},
+        {"--mode 8x3x32", "ff", "see a.actual.png; it is 8x3, and not 9x3\n", 1}};
+    for (auto const& [options, pixels, text, status] : cases) {
+        auto const outcome = run(options, pixels);
+        EXPECT_EQ(outcome.status, status) << outcome.out;
+        EXPECT_NE(outcome.out.find(text), std::string::npos) << outcome.out;
+    }
+    auto const difference = ReadPicture(folder + "/a.difference.png");
+    EXPECT_EQ(std::vector(difference.begin(), difference.begin() + 4),
+        (std::vector{0xC0C0FFu, 0xFF0000u, 0xFF0000u, 0xC0C0C0u}));
+    EXPECT_EQ(ReadPicture(folder + "/a.actual.png").size(), 24u);
+    Shell("rm -r " + folder);
 }
 
 TEST(ConsoleTool, ScriptPlaysBesideTheProgram)

@@ -62,10 +62,7 @@ int Follow(std::span<char*> words)
     if (auto const* const problem = std::get_if<std::string>(&read))
         return Complain(*problem + " (--help tells more)", kConsoleFailed);
     auto const& options = std::get<console::Options>(read);
-    if (options.help) {
-        std::fputs(console::kHelp, stdout);
-        return 0;
-    }
+    if (options.told != nullptr) return std::fputs(options.told, stdout), 0;
     std::optional<console::Script> script;
     if (!options.script.empty()) {
         auto parsed = console::ReadScript(options.script);

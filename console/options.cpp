@@ -4,7 +4,9 @@
 
 namespace console {
 
-char const* const kHelp =
+namespace {
+
+constexpr char kHelp[] =
     R"(Usage: tessella-console [OPTION]... -- PROGRAM [ARGUMENT]...
 
 Runs a program on a virtual Linux console: a framebuffer, a tty with the console's requests, and a PS/2 mouse,
@@ -28,6 +30,7 @@ at the device paths where programs look for them. No root, no device and no chan
                               let the driver tell of pixels of BITS bits with fields of these lengths,
                               whatever the mode is: to see how a program takes a mode that it doesn't support
   --help                      show this
+  --version                   show the version
 
 A script has one command a line; what follows a word that begins with # is a comment. Times are milliseconds.
 
@@ -54,8 +57,6 @@ The exit status is the program's, or 128 and the signal's number if one killed i
 ended it. If the program reports no failure of its own: 1 if the screen was not as expected, 2 if the console
 or the script couldn't do its part. 127 if the program couldn't be run.
 )";
-
-namespace {
 
 using Problem = std::string;
 
@@ -131,8 +132,8 @@ std::variant<Options, Problem> Reader::Read(std::span<char*> words)
         if (!word.starts_with("-")) break;
         words = words.subspan(1);
         if (word == "--") break;
-        if (word == "--help") {
-            options.help = true;
+        if (word == "--help" || word == "--version") {
+            options.told = word == "--help" ? kHelp : "tessella-console " TESSELLA_VERSION "\n";
             return options;
         }
         if (word == "--bless") {

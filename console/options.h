@@ -15,12 +15,10 @@ struct Options {
     std::string screenshot;  ///< a file's path, empty for none
     std::string script;      ///< likewise
     PlayMode playMode = PlayMode::Compare;
-    bool printSteps = false;   ///< of the script, and run nothing
-    bool help = false;         ///< nothing else counts then
-    std::span<char*> program;  ///< with its arguments; part of the command line
+    bool printSteps = false;     ///< of the script, and run nothing
+    char const* told = nullptr;  ///< what the user wants to be told; nothing else counts then
+    std::span<char*> program;    ///< with its arguments; part of the command line
 };
-
-extern char const* const kHelp;
 
 /// Reads the words after the tool's name. Gives what is wrong, in one sentence, if they cannot be followed.
 std::variant<Options, std::string> ReadOptions(std::span<char*> words);

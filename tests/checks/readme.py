@@ -1,5 +1,5 @@
-"""Builds the README's program as the README says, against an installed tree, with CMake and with pkg-config, and runs
-both on the virtual console. Argument: the build folder."""
+"""Builds the README's program as the README says, against an installed tree and the one that the packages have, with
+CMake and with pkg-config, and runs both on the virtual console. Argument: the build folder."""
 import os
 import pathlib
 import re
@@ -32,13 +32,29 @@ def run(*command, **options):
     subprocess.run(command, check=True, **options)
 
 
-build = pathlib.Path(sys.argv[1])
-with tempfile.TemporaryDirectory() as folder:
-    prefix, here = pathlib.Path(folder, "prefix"), pathlib.Path(folder, "hello")
+def installed(build, folder):
+    """A tree as the README installs it."""
+    run("cmake", "--install", build, "--prefix", folder / "installed", stdout=subprocess.DEVNULL)
+    return folder / "installed"
+
+
+def packaged(build, folder):
+    """A tree as the packages have it."""
+    run("cpack", "--config", build / "CPackConfig.cmake", "-B", folder / "packages", cwd=build, stdout=subprocess.DEVNULL)
+    packages = sorted((folder / "packages").glob("*.deb"))
+    assert [one.name.split("_")[0] for one in packages] == ["libtessella-dev", "libtessella1", "tessella-tools"]
+    for package in packages:
+        run("dpkg-deb", "--extract", package, folder / "root")
+    return folder / "root" / "usr"
+
+
+def check(prefix, here):
+    """Builds and runs the program in an empty folder, against the tree."""
     here.mkdir()
-    run("cmake", "--install", build, "--prefix", prefix, stdout=subprocess.DEVNULL)
     for name in ("common", "file"):
         assert not (prefix / "include" / name).exists(), f"{name} is not for applications"
+    for tool in (prefix / "bin").iterdir():
+        assert (prefix / "share" / "man" / "man1" / f"{tool.name}.1").exists(), f"{tool.name} has no manual page"
 
     (here / "hello.cpp").write_text(block("cpp"), encoding="utf-8")
     (here / "CMakeLists.txt").write_text(block("cmake") + CONSOLE_TEST, encoding="utf-8")
@@ -61,4 +77,9 @@ with tempfile.TemporaryDirectory() as folder:
             screen = read_png(here / picture)
             found = [screen.at(y * screen.width + x) for x, y in POINTS]
             assert found == colours, f"{found} instead of {colours}"
-print("the README's program builds and runs both ways")
+
+
+with tempfile.TemporaryDirectory() as temporary:
+    base = pathlib.Path(temporary)
+    for tree in (installed, packaged):
+        check(tree(pathlib.Path(sys.argv[1]), base), base / f"hello_{tree.__name__}")

@@ -1,0 +1,34 @@
+# What `cpack` makes in the build folder: Debian packages of the library, of what one builds programs with, and of the
+# tools.
+set(CPACK_GENERATOR DEB)
+set(CPACK_PACKAGE_NAME tessella)
+set(CPACK_PACKAGE_VENDOR "Tessella")
+set(CPACK_PACKAGE_CONTACT "the Tessella maintainers")
+set(CPACK_PACKAGING_INSTALL_PREFIX /usr)
+set(CPACK_STRIP_FILES ON)
+set(CPACK_VERBATIM_VARIABLES ON)
+set(CPACK_COMPONENTS_ALL runtime development tools)
+
+set(CPACK_DEB_COMPONENT_INSTALL ON)
+set(CPACK_DEBIAN_FILE_NAME DEB-DEFAULT)
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
+set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
+set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS_PRIVATE_DIRS ${PROJECT_BINARY_DIR}/tessella ${PROJECT_BINARY_DIR}/bundle)
+set(same_version "libtessella1 (= ${PROJECT_VERSION})")
+
+set(CPACK_DEBIAN_RUNTIME_PACKAGE_NAME libtessella1)
+set(CPACK_DEBIAN_RUNTIME_PACKAGE_SECTION libs)
+set(CPACK_COMPONENT_RUNTIME_DESCRIPTION "${PROJECT_DESCRIPTION}: the library")
+
+set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_NAME libtessella-dev)
+set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SECTION libdevel)
+set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS ${same_version})
+set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_RECOMMENDS tessella-tools)
+set(CPACK_COMPONENT_DEVELOPMENT_DESCRIPTION "${PROJECT_DESCRIPTION}: headers, and packages for CMake and pkg-config")
+
+set(CPACK_DEBIAN_TOOLS_PACKAGE_NAME tessella-tools)
+set(CPACK_DEBIAN_TOOLS_PACKAGE_SECTION utils)
+set(CPACK_DEBIAN_TOOLS_PACKAGE_DEPENDS ${same_version})
+set(CPACK_COMPONENT_TOOLS_DESCRIPTION
+    "${PROJECT_DESCRIPTION}: the virtual console, and what looks after real ones")
+include(CPack)

@@ -24,9 +24,9 @@ enum : std::uint32_t {
 /// records. It runs on the calling thread, in the midst of the operations that say so.
 ///
 /// Among siblings, earlier in the list means closer to the viewer. A window is seen within its parent only,
-/// and a parent's pixels are those that its children leave. Coordinates are screen coordinates, also those
-/// of children, except where an operation says *window coordinates*: they count from `bounds.x1`,
-/// `bounds.y1`.
+/// and on its parent's shadow; a parent's pixels are those that its children leave. Coordinates are screen
+/// coordinates, also those of children, except where an operation says *window coordinates*: they count from
+/// `bounds.x1`, `bounds.y1`.
 ///
 /// Nothing is painted at once. What a change uncovers or alters is *invalid*, and `GrGetEvent` hands it out
 /// as paint events, from the top of the screen downward, one a window.
@@ -41,7 +41,8 @@ public:
     GrRegion region;             ///< the exact shape
     GrRegion* shadow = nullptr;  ///< the shape of the shadow; null without one; owned by the window
 
-    /// The context that `GetContext` gives while the library has the window paint off screen; else null.
+    /// The context that `GetContext` gives while the library has the window paint off screen, into the image
+    /// of a shadow; else null.
     GrContext* context = nullptr;
     GrRegion reservedRegion;     ///< always empty
     std::uint32_t flags = 0;     ///< `GrWindowVisible` and the others
@@ -71,6 +72,7 @@ public:
     static GrWindow* WindowAtXY(int x, int y, bool withShadow);
 
     /// Finds the next area that is due for paint and takes it for valid from now on, so the caller paints it.
+    /// Shadows in it are painted at once, which runs the callback.
     /// `event` becomes a paint event. With null, only tells whether anything is due. False if nothing is, or
     /// while the console shows somebody else's screen.
     static bool GetPaintEvent(GrEvent* event);
@@ -102,6 +104,7 @@ public:
     /// Puts the window on top of its siblings. What it gains is due for paint.
     void Raise();
     /// Puts the window below all its siblings. What it loses is due for paint by those that it uncovers.
+    /// Shadows do not count here: what they uncover stays as it is until something else has it painted.
     void Lower();
 
     /// Makes the window visible and all of it due for paint, and tells the callback (`GrEventWindowShown`).
@@ -124,16 +127,34 @@ public:
     /// one puts it to the screen's corner. Nothing on the root.
     void SetWindowRegion(GrRegion const& shape);
 
+    /// Has the window cast a shadow, 5 pixels to the right and downward, or not; nothing if it is so already.
+    /// What this changes is due for paint. The shadow goes where the window goes and has its shape; it lies
+    /// beyond the window, within the parent, and input passes through it. On the root it means nothing.
+    ///
+    /// The library paints shadows itself, whenever paint is asked for: it has the windows below paint off
+    /// screen, through the callback, darkens that and copies it to the screen. Such paint events are like any
+    /// other, except that `GetContext` gives a context over an image, which goes when the receiver has
+    /// returned. The receiver must not destroy any window nor ask for paint meanwhile, and finds colours,
+    /// pattern and raster mode of the context as others have left them. A window with nothing but a shadow to
+    /// paint still gets its event, with an empty rectangle.
+    void SetShadowed(bool shadowed);
+    /// Paints `area` (screen coordinates), a part of the shadow on the screen without gaps between its rows.
+    /// What it was is lost: it holds what did not lie to the right of the bounds, nor below them. A tool for
+    /// the library, which calls it when paint is asked for.
+    void DrawShadow(GrRegion& area);
+
     /// Writes the pixels of this window that nothing covers into `out`. Of its children, those above `stop`
     /// count as covering; with null, all. `fromValid` limits the result to what is valid; `withShadow` counts
     /// shadows in, the window's own as well as covering ones.
     void DoGetClipRegion(GrRegion& out, GrWindow const* stop, bool fromValid, bool withShadow);
 
-    /// A context with its origin at the window's corner, clipped to what is seen of the window now; later
-    /// changes of the tree do not reach it. Returned through `FreeContext`. It draws in the mode that it was
+    /// A context with its origin at the window's corner, clipped to what is seen now of the window and of its
+    /// own shadow: a window with a shadow keeps to its `region` by itself. Later changes of
+    /// the tree do not reach the context. Returned through `FreeContext`. It draws in the mode that it was
     /// made in, and must not be used in another. Null before the first session.
     GrContext* GetContext();
-    /// The same, with the area of the children included. Returned through `FreeContext`.
+    /// The same with the area of the children included, and of all shadows, which do not count here. Never a
+    /// context over an image: what is drawn goes to the screen. Returned through `FreeContext`.
     GrContext* GetNonclipContext();
     /// Takes back a context of this window; null is allowed.
     void FreeContext(GrContext* freed) const;

@@ -28,6 +28,7 @@ NEVER = [
     (r"examples/gallery/.*", r"(?!include/tessella|examples/gallery/|<).*", "examples have what applications have"),
     (r"examples/keys/.*", r"(?!include/tessella|examples/keys/|<).*", "examples have what applications have"),
     (r"examples/text/.*", r"(?!include/tessella|examples/text/|<).*", "examples have what applications have"),
+    (r"examples/desktop/.*", r"(?!include/tessella|examples/desktop/|<).*", "examples have what applications have"),
     (r"(?!tests/).*", r"tests/.*", "production never knows its tests"),
 ]
 

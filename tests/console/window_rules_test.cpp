@@ -103,7 +103,8 @@ GrRegion Scattered(std::mt19937& random)
 PlainRegion const& Plain(GrRegion const& region) { return static_cast<PlainRegion const&>(region); }
 
 /// The steps of a clip, carried out with plain merges.
-void PlainClip(PlainRegion& out, GrWindow const& window, GrWindow const* stop, bool fromValid)
+void PlainClip(
+    PlainRegion& out, GrWindow const& window, GrWindow const* stop, bool fromValid, bool withShadow)
 {
     if (!window.IsVisible()) return out.Clear();
     if (!window.parent) {
@@ -112,11 +113,17 @@ void PlainClip(PlainRegion& out, GrWindow const& window, GrWindow const* stop, b
         else
             out = window.bounds;
     } else {
-        PlainClip(out, *window.parent, &window, fromValid);
-        out &= Plain(window.region);
+        PlainClip(out, *window.parent, &window, fromValid, withShadow);
+        PlainRegion extent;
+        extent = Plain(window.region);
+        if (withShadow && window.shadow) extent += Plain(*window.shadow);
+        out &= extent;
     }
     for (GrWindow const* child = window.first; child && child != stop && out; child = child->next)
-        if (child->IsVisible()) out -= Plain(child->region);
+        if (child->IsVisible()) {
+            out -= Plain(child->region);
+            if (withShadow && child->shadow) out -= Plain(*child->shadow);
+        }
 }
 
 TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
@@ -125,7 +132,12 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
         setenv("VELLUM_SAFE_ASSERT", "none", 1);  // merges with gaps report what they find
         Sizes sizes;
         ASSERT_TRUE(Init(sizes));
-        GrWindow::SetCallback([](GrEvent const&) {});
+        GrWindow::SetCallback([](GrEvent const& event) {  // paint is that of shadows
+            if (event.type != GrEventPaint) return;
+            GrContext* const context = event.window->GetContext();
+            context->FillRegion(GrRect{-99, -99, 99, 99});
+            event.window->FreeContext(context);
+        });
         std::mt19937 random(7);
         std::deque<GrWindow> windows;
         for (int i = 0; i < 8; ++i) {
@@ -137,18 +149,28 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
             for (GrWindow& window : windows) {
                 window.Move(static_cast<int>(random() % 30) - 5, static_cast<int>(random() % 30) - 5);
                 window.SetWindowRegion(Scattered(random));
+                window.SetShadowed(random() % 2 == 0);
                 if (random() % 2 == 0) window.Raise();
                 if (random() % 4 == 0) window.Lower();
+                if (!window.shadow) continue;
+                PlainRegion shadow;
+                shadow = Plain(window.region);
+                shadow.Offset(5, 5);
+                shadow -= Plain(window.region);
+                ASSERT_EQ(BandsText(*window.shadow), BandsText(shadow));
             }
+            GrRegion anywhere = Scattered(random);
+            windows[0].DrawShadow(anywhere);  // comes to an end
             GrEvent event;
             for (int events = 0; GrWindow::GetPaintEvent(nullptr); ++events) {
                 for (GrWindow& window : windows)
-                    for (bool const fromValid : {false, true}) {
+                    for (unsigned const flags : {0u, 1u, 2u, 3u}) {
+                        bool const fromValid = (flags & 1) != 0, withShadow = (flags & 2) != 0;
                         GrRegion clip;
                         PlainRegion plain;
                         GrWindow const* const stop = random() % 2 == 0 ? window.first : nullptr;
-                        window.DoGetClipRegion(clip, stop, fromValid, true);
-                        PlainClip(plain, window, stop, fromValid);
+                        window.DoGetClipRegion(clip, stop, fromValid, withShadow);
+                        PlainClip(plain, window, stop, fromValid, withShadow);
                         ASSERT_EQ(BandsText(clip), BandsText(plain));
                     }
                 GrRegion before = Screen.bounds;
@@ -164,6 +186,29 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
         }
         while (!windows.empty())
             windows.pop_back();
+        GrDone();
+    });
+}
+
+TEST(Windows, AHandlerThatThrowsInAShadowLeavesTheScreenUsable)
+{
+    OnConsole("40x36x16", nullptr, [](console::VirtualConsole& virtualConsole) {
+        Sizes sizes;
+        ASSERT_TRUE(Init(sizes));
+        GrWindow::SetCallback([](GrEvent const& event) {
+            if (event.type == GrEventPaint && event.window == GrWindow::RootWindow()) throw std::bad_alloc();
+        });
+        GrWindow window(GrWindow::RootWindow(), 4, 4, 2000000000, 20, nullptr);
+        window.SetShadowed(true);
+        window.Show();
+        GrEvent event;
+        EXPECT_THROW(while (GrWindow::GetPaintEvent(&event)), std::bad_alloc);
+        EXPECT_EQ(GrWindow::RootWindow()->context, nullptr);
+        GrScreen.context->SetForeColor(GrMakeColor(255, 255, 255));
+        GrScreen.context->FillRegion(GrRect{0, 0, 40, 36});
+        EXPECT_EQ(virtualConsole.Screen().At(0, 0), 0xFFFFFFu);
+        GrWindow::SetCallback([](GrEvent const&) {});
+        window.Hide();
         GrDone();
     });
 }

@@ -7,6 +7,7 @@
 #include <limits>
 #include <optional>
 #include <unicode/uchar.h>
+#include <unicode/unorm2.h>
 
 namespace tools {
 
@@ -104,11 +105,33 @@ private:
     bool HasBitmap(char16_t code) const { return code != 0 && bitmaps.Has(code); }
     bool IsInBoth(char16_t code) const { return HasBitmap(code) && smallLetters.Has(code); }
 
+    /// The character of the bitmaps that looks the same in the outlines; 0 if there is none.
+    char16_t FindAlike(char16_t code) const
+    {
+        auto const found = alike.find(smallLetters.Shape(code));
+        return found == alike.end() ? char16_t{0} : found->second;
+    }
+
+    /// The same, for a Cyrillic letter with an accent of which only the letter below it looks the same: the
+    /// outlines have Ё wider than Ë.
+    char16_t FindAlikeBelowAccent(char16_t code) const
+    {
+        if (ublock_getCode(code) != UBLOCK_CYRILLIC) return 0;
+        UErrorCode error = U_ZERO_ERROR;
+        auto const* const normalizer = unorm2_getNFCInstance(&error);
+        char16_t parts[2];  // the letter and its accent
+        if (unorm2_getDecomposition(normalizer, code, parts, 2, &error) != 2 || U_FAILURE(error)) return 0;
+        auto const composed = unorm2_composePair(normalizer, FindAlike(parts[0]), parts[1]);
+        return composed > 0 && HasBitmap(static_cast<char16_t>(composed)) ? static_cast<char16_t>(composed)
+                                                                          : 0;
+    }
+
     /// Letters that look the same in two alphabets, as they do in the outlines, do so here.
     Glyph FromOutlines(char16_t code) const
     {
-        auto const twin = alike.find(smallLetters.Shape(code));
-        if (twin != alike.end()) return bitmaps.Read(twin->second);
+        auto twin = FindAlike(code);
+        if (twin == 0) twin = FindAlikeBelowAccent(code);
+        if (twin != 0) return bitmaps.Read(twin);
         auto glyph = (u_islower(code) ? smallLetters : capitals).Read(code);
         // At these sizes hinting leaves some letters no room.
         if (u_isalpha(code))

@@ -24,6 +24,7 @@ void DrawImages(Plate const& page);
 void DrawDithering(Plate const& page);
 void DrawAlpha(Plate const& page);
 void DrawMasks(Plate const& page);
+void DrawTexts(Plate const& page);
 void DrawCursors(Plate const& page);
 
 }

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <cstring>
 #include <limits>
 #include <span>
 
@@ -106,6 +107,94 @@ private:
     LocalRegion const gaps;  ///< from `painted` on
 };
 
+/// Transparent glyphs of bits, collected in one picture and painted together: rows of the surface lie so far
+/// apart that to walk them glyph by glyph takes longer than to put the bits side by side before.
+template <typename S>
+class GrGenericContextBase<S>::TextInk {
+public:
+    explicit TextInk(GrGenericContextBase& drawnContext) : context(drawnContext) {}
+    ~TextInk() { Paint(); }
+    TextInk(TextInk const&) = delete;
+    TextInk& operator=(TextInk const&) = delete;
+
+    /// Takes a glyph of bits; false if it is too large.
+    bool Add(GrRect const& box, GrGlyphInfo const& glyph)
+    {
+        if (box.IsEmpty()) return true;
+        if (!place.IsEmpty() && !IsWithin(box)) Paint();
+        if (place.IsEmpty()) {
+            // Where vectors are aligned, and with room for glyphs that stand higher.
+            left = std::max(box.x1, kFarthest) & -kAlignment;
+            top = std::max(box.y1, kFarthest) - kRows / 4;
+        }
+        if (glyph.width > GrBitsReader::kMost || glyph.rows > kRows || !IsWithin(box)) return false;
+        Clear(box);
+        Collect(box, BitsOf(glyph));
+        return true;
+    }
+
+    /// Paints all that has been collected.
+    void Paint()
+    {
+        if (place.IsEmpty()) return;
+        GrBits const bits{RowOf(place.y1), place.x2 - place.x1, place.y2 - place.y1, kPitch, false};
+        context.DrawBits(place.x1, place.y1, bits, true);
+        place = {};
+    }
+
+private:
+    static constexpr int kWidth = 512, kRows = 64, kAlignment = 16, kPitch = kWidth / 8;
+    static constexpr int kFarthest = std::numeric_limits<int>::min() / 2;
+
+    bool IsWithin(GrRect const& box) const
+    {
+        constexpr int kMax = std::numeric_limits<int>::max();  // a box that reaches it may be cut off there
+        return box.x1 >= left && box.y1 >= top && box.x2 < kMax && std::int64_t{box.x2} - left <= kWidth &&
+            box.y2 < kMax && std::int64_t{box.y2} - top <= kRows;
+    }
+
+    unsigned char* RowOf(int y) { return ink + std::ptrdiff_t{y - top} * kPitch; }
+
+    /// Makes the place hold the box, too.
+    void Clear(GrRect const& box)
+    {
+        if (place.IsEmpty()) place = {left, box.y1, left, box.y1};
+        for (; place.y1 > box.y1; --place.y1)
+            std::fill_n(RowOf(place.y1 - 1), kPitch, std::uint8_t{0});
+        for (; place.y2 < box.y2; ++place.y2)
+            std::fill_n(RowOf(place.y2), kPitch, std::uint8_t{0});
+        place.x2 = std::max(place.x2, box.x2);
+    }
+
+    void Collect(GrRect const& box, GrBits const& bits)
+    {
+        GrBitsReader const reader(bits);
+        auto const inside = ~std::uint64_t{0} >> (64 - bits.width);
+        auto const glyphWidth = static_cast<unsigned>(bits.width);
+        int const column = box.x1 - left;
+        unsigned char* to = RowOf(box.y1) + column / 8;
+        int const most = static_cast<int>((GrBitsReader::kMost - glyphWidth) / reader.pitch) + 1;
+        std::size_t first = 0;
+        for (int rows = bits.height; rows > 0;
+             rows -= most, first += reader.pitch * static_cast<unsigned>(most)) {
+            std::uint64_t read = reader.Read(first);
+            for (int y = std::min(rows, most);; read >>= reader.pitch) {
+                std::uint64_t word;
+                std::memcpy(&word, to, sizeof word);
+                word |= (read & inside) << column % 8;
+                std::memcpy(to, &word, sizeof word);
+                to += kPitch;
+                if (--y == 0) break;
+            }
+        }
+    }
+
+    GrGenericContextBase& context;
+    GrRect place{};                                            ///< what has been collected, on the surface
+    int left, top;                                             ///< of the picture
+    std::uint8_t ink[kRows * kPitch + sizeof(std::uint64_t)];  ///< words may reach beyond the last row
+};
+
 template <typename S>
 template <typename Character>
 void GrGenericContextBase<S>::DrawCharacters(
@@ -119,6 +208,8 @@ void GrGenericContextBase<S>::DrawCharacters(
 
     typename S::TextGuard const guard(*this);
     bool const gapsLast = !transparent && (bold || !GoesForward(font, text, length));
+    bool const collects = transparent && !bold && this->IsSolid();
+    TextInk ink(*this);
     TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), gapsLast);
     GrGlyphInfo glyph;
     unsigned previous = 0;
@@ -130,7 +221,10 @@ void GrGenericContextBase<S>::DrawCharacters(
             pen = Moved(Moved(pen, static_cast<int>(glyph.advance)), bold);
             int shift[2];
             if (previous != 0 && font.GetKerning(shift, code, previous)) box = Moved(box, shift[0], shift[1]);
-            StrikeGlyph(box, glyph, transparent);
+            if (!collects || glyph.bitsPerPixel != 1 || !ink.Add(box, glyph)) {
+                ink.Paint();
+                StrikeGlyph(box, glyph, transparent);
+            }
             if (bold) Embolden(box, glyph, transparent);
             if (!transparent) back.Pass({box.x1, box.y1, Moved(box.x2, bold), box.y2}, pen);
         }

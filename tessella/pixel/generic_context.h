@@ -99,6 +99,7 @@ private:
     void FillLines(GrRegion const& region, Walker& walker) const;
 
     class TextBack;
+    class TextInk;
     template <typename Character>
     void DrawCharacters(int x, int y, Character const* text, unsigned length, GrFont& font, bool transparent);
     /// Draws a glyph whose bitmap goes to `box`, in surface coordinates; and once more, a pixel beside it.

@@ -24,8 +24,10 @@ NEVER = [
     (r"tessella/(mouse|keyboard)_l.*", r"(include/)?tessella/(window|key_layout).*",
      "device threads push and wake"),
     (PUBLIC, rf"(?!{PUBLIC}|{CXX_LIBRARY}|<sys/time\.h>).*", "the boundary is the product"),
-    (r"examples/[^/]*", r"(?!include/tessella|<).*", "examples have what applications have"),
+    (r"examples/[^/]+", r"(?!include/tessella|<).*", "examples have what applications have"),
     (r"examples/gallery/.*", r"(?!include/tessella|examples/gallery/|<).*", "examples have what applications have"),
+    (r"examples/keys/.*", r"(?!include/tessella|examples/keys/|<).*", "examples have what applications have"),
+    (r"examples/text/.*", r"(?!include/tessella|examples/text/|<).*", "examples have what applications have"),
     (r"examples/desktop/.*", r"(?!include/tessella|examples/desktop/|<).*", "examples have what applications have"),
     (r"(?!tests/).*", r"tests/.*", "production never knows its tests"),
 ]

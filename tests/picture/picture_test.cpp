@@ -21,6 +21,8 @@ using gallery::Page;
 constexpr int kWidth = 128, kHeight = 96;
 using Bytes = std::vector<std::uint8_t>;
 
+int const languageIsSet = setenv("LC_ALL", "en", 1);  // it chooses fonts
+
 /// Three bytes a pixel, red first; empty if there is no such picture.
 Bytes ReadPng(std::string const& path)
 {
@@ -124,6 +126,25 @@ TEST(Pictures, OfEveryPageInTheFormatsThatOnlyImagesHave)
         }
         GrDone();
     });
+}
+
+TEST(Pictures, OfTextOweNothingToTheMachineButItsLanguage)
+{
+    struct Setting {
+        char const *variable, *value;
+        bool isSame;
+    };
+    for (Setting const& setting : {Setting{"FONTCONFIG_FILE", "/dev/null", true}, {"HOME", "/nowhere", true},
+             {"LC_ALL", "tr_TR.ISO-8859-9", true}, {"LC_ALL", "none", true}, {"LC_ALL", "zh_TW.BIG5", false}})
+        OnConsole("128x96x32", nullptr, [&setting](console::VirtualConsole&) {
+            setenv(setting.variable, setting.value, 1);
+            Sizes sizes;
+            ASSERT_TRUE(Init(sizes));
+            auto const image = DrawToImage({"text", gallery::DrawTexts}, {32, GrImageTrueColor});
+            EXPECT_EQ(PictureOf(*image) == ReadPng(PICTURE_REFERENCES "text-24.png"), setting.isSame)
+                << setting.variable << '=' << setting.value;
+            GrDone();
+        });
 }
 
 }

@@ -32,7 +32,9 @@ public:
     /// `drawnImage` is what the context draws on, or null for a screen.
     RandomBlits(GrContext& drawnContext, GrImage const* drawnImage, Canvas& judgingCanvas, unsigned seed)
         : context(drawnContext), drawn(drawnImage), canvas(judgingCanvas), format(canvas.format), random(seed)
-    {}
+    {
+        GrColors4::BuildColorCube();  // which only the first image of 4 bits does
+    }
 
     void Step()
     {

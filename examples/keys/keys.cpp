@@ -1,16 +1,20 @@
 // A picture of the keyboard. Keys that are held light up, lock keys have a lamp, and a dead key glows until
-// it has met its letter. Each event stands in full on the standard output. Escape ends, when it is released.
+// it has met its letter. A key is labelled as on an American keyboard, until it shows what it types. The
+// latest events stand below, and all of them on the standard output. Escape ends, when it is released.
 //
 // The screen belongs to the picture, so the output is read elsewhere: keys >events.txt
-#include <tessella.h>
+#include "keyboard.h"
 
 #include <algorithm>
-#include <array>
 #include <cstdio>
+#include <deque>
 #include <iostream>
+#include <map>
+#include <memory>
 #include <optional>
 #include <set>
 #include <span>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -20,6 +24,7 @@ constexpr GrColor kGround = GrMakeColor(28, 36, 48), kGroundDots = GrMakeColor(3
 constexpr GrColor kCase = GrMakeColor(72, 80, 96), kCaseEdge = GrMakeColor(112, 122, 140);
 constexpr GrColor kWell = GrMakeColor(44, 50, 62), kLampOff = GrMakeColor(24, 40, 32);
 constexpr GrColor kLocked = GrMakeColor(96, 240, 112);
+constexpr GrColor kInk = GrMakeColor(40, 40, 48), kEventInk = GrMakeColor(200, 212, 228);
 
 /// Of a key cap: its face, the light on its upper edge, and its sides.
 struct CapColors {
@@ -32,113 +37,13 @@ constexpr CapColors kFunction = {
 constexpr CapColors kHeld = {GrMakeColor(255, 168, 32), GrMakeColor(255, 212, 128), GrMakeColor(176, 96, 8)};
 constexpr CapColors kDead = {GrMakeColor(64, 152, 248), GrMakeColor(144, 200, 255), GrMakeColor(24, 80, 168)};
 
-struct Key {
-    std::uint32_t vk;
-    GrRect place;  // in quarters of a key's side, from the corner of the keyboard
-    bool isLetter;
-};
-
-/// Puts keys side by side, from left to right.
-class Row {
-public:
-    Row(std::vector<Key>& keyboard, int left, int top) : keys(keyboard), x(left), y(top) {}
-    Row& Gap(int width) { return x += width, *this; }
-    Row& Letter(std::uint32_t vk, int width = 4) { return Add(vk, width, 4, true); }
-    Row& Letters(std::string_view letters)
-    {
-        for (char const letter : letters)
-            Letter(static_cast<unsigned char>(letter));
-        return *this;
-    }
-    Row& Function(std::uint32_t vk, int width = 4, int height = 4) { return Add(vk, width, height, false); }
-    Row& Functions(std::uint32_t first, int count)
-    {
-        for (int i = 0; i < count; ++i)
-            Function(first + static_cast<unsigned>(i));
-        return *this;
-    }
-
-private:
-    Row& Add(std::uint32_t vk, int width, int height, bool isLetter)
-    {
-        keys.push_back({vk, {x, y, x + width, y + height}, isLetter});
-        return Gap(width);
-    }
-
-    std::vector<Key>& keys;
-    int x, y;
-};
-
-constexpr int kWide = 92, kHigh = 26;  // the keyboard, in quarters of a key's side
-
-std::vector<Key> BuildKeyboard()
-{
-    std::vector<Key> keys;
-    Row(keys, 0, 0)
-        .Function(GrVkEscape)
-        .Gap(4)
-        .Functions(GrVkF1, 4)
-        .Gap(2)
-        .Functions(GrVkF1 + 4, 4)
-        .Gap(2)
-        .Functions(GrVkF1 + 8, 4);
-    Row(keys, 0, 6).Letters("`1234567890-=").Function(GrVkBackspace, 8);
-    Row(keys, 0, 10).Function(GrVkTab, 6).Letters("qwertyuiop{}").Letter('\\', 6);
-    Row(keys, 0, 14).Function(GrVkCapsLock, 7).Letters("asdfghjkl;'").Function(GrVkReturn, 9);
-    Row(keys, 0, 18)
-        .Function(GrVkLeftShift, 5)
-        .Letter(GrVkLessGreater)
-        .Letters("zxcvbnm,")
-        .Letter(GrVkPeriod)
-        .Letter('/')
-        .Function(GrVkRightShift, 11);
-    Row(keys, 0, 22)
-        .Function(GrVkLeftControl, 5)
-        .Function(GrVkLeftLogo, 5)
-        .Function(GrVkLeftAlt, 5)
-        .Letter(' ', 25)
-        .Function(GrVkRightAlt, 5)
-        .Function(GrVkRightLogo, 5)
-        .Function(GrVkMenu, 5)
-        .Function(GrVkRightControl, 5);
-
-    Row(keys, 62, 0).Function(GrVkSystemRequest).Function(GrVkScrollLock).Function(GrVkPause);
-    Row(keys, 62, 6).Function(GrVkInsert).Function(GrVkHome).Function(GrVkPageUp);
-    Row(keys, 62, 10).Function(GrVkDelete).Function(GrVkEnd).Function(GrVkPageDown);
-    Row(keys, 66, 18).Function(GrVkUp);
-    Row(keys, 62, 22).Function(GrVkLeft).Function(GrVkDown).Function(GrVkRight);
-
-    Row(keys, 76, 6)
-        .Function(GrVkNumLock)
-        .Function(GrVkPadDivide)
-        .Function(GrVkPadMultiply)
-        .Function(GrVkPadSubtract);
-    Row(keys, 76, 10).Letter(GrVkPad0 + 7).Letter(GrVkPad0 + 8).Letter(GrVkPad9).Function(GrVkPadAdd, 4, 8);
-    Row(keys, 76, 14).Letter(GrVkPad0 + 4).Letter(GrVkPad0 + 5).Letter(GrVkPad0 + 6);
-    Row(keys, 76, 18)
-        .Letter(GrVkPad0 + 1)
-        .Letter(GrVkPad0 + 2)
-        .Letter(GrVkPad0 + 3)
-        .Function(GrVkPadEnter, 4, 8);
-    Row(keys, 76, 22).Letter(GrVkPad0, 8).Letter(GrVkPadDecimal);
-    return keys;
-}
-
 std::vector<Key> const keyboard = BuildKeyboard();
-std::set<std::uint32_t> held;          // keys, as `KeyOf` names them
-std::uint32_t locks = 0;               // flags of modifiers
-std::optional<std::uint32_t> deadKey;  // the one that waits for its letter
-
-/// Some keys have two codes: those of the pad by num lock, and M by the layout.
-std::uint32_t KeyOf(std::uint32_t vk)
-{
-    constexpr std::uint32_t kPad[] = {GrVkPadInsert, GrVkPadEnd, GrVkPadDown, GrVkPadPageDown, GrVkPadLeft,
-        GrVkPadCentre, GrVkPadRight, GrVkPadHome, GrVkPadUp, GrVkPadPageUp};
-    if (auto const* const found = std::ranges::find(kPad, vk); found != std::end(kPad))
-        return GrVkPad0 + static_cast<std::uint32_t>(found - kPad);
-    if (vk == GrVkPadDelete) return GrVkPadDecimal;
-    return vk == 'M' ? 'm' : vk;
-}
+std::set<std::uint32_t> held;             // keys, as `KeyOf` names them
+std::uint32_t locks = 0;                  // flags of modifiers
+std::optional<std::uint32_t> deadKey;     // the one that waits for its letter
+std::map<std::uint32_t, char16_t> typed;  // what keys have typed last in this layout
+std::deque<std::u16string> events;        // the latest ones, as many as there is room for
+bool eventsAreNew = false;                // some of them have not been painted
 
 struct Lock {
     std::uint32_t flag, vk;
@@ -164,11 +69,34 @@ bool Touch(GrRect const& a, GrRect const& b)
 
 GrRect Inside(GrRect const& rect, int by) { return {rect.x1 + by, rect.y1 + by, rect.x2 - by, rect.y2 - by}; }
 
+struct Fonts {
+    std::unique_ptr<GrFont> letters, words;  // on keys
+    std::unique_ptr<GrFont> events;
+};
+std::optional<Fonts> fonts;
+GrRect eventPlace;  // below the keyboard
+
+std::unique_ptr<GrFont> NewFont(int pixels)
+{
+    // A size is in 1000ths of an inch, of which 96 pixels make one.
+    auto const size = static_cast<unsigned>(pixels * 1000 + 48) / 96;
+    return std::unique_ptr<GrFont>(GrFont::Create("scalable", size, false, 400, true, false));
+}
+
 void PlaceKeyboard(int width, int height)
 {
     unit = std::max(1, std::min(width / (kWide + 6), height / (kHigh + 6)));
     left = (width - kWide * unit) / 2;
     top = (height - kHigh * unit) / 2;
+    eventPlace = {left, top + (kHigh + 4) * unit, width, height};
+    fonts = Fonts{NewFont(2 * unit), NewFont(unit + 1), NewFont(13)};
+}
+
+void Write(GrContext& context, GrFont& font, int x, int y, std::u16string_view text, GrColor color)
+{
+    context.SetForeColor(color);
+    context.DrawTextW(x, y, reinterpret_cast<unsigned short const*>(text.data()),
+        static_cast<unsigned>(text.size()), &font, true);
 }
 
 /// A rectangle without its corners.
@@ -190,6 +118,22 @@ void DrawLamp(GrContext& context, GrRect const& place, bool on)
     FillRounded(context, Inside(place, 1), (place.y2 - place.y1) / 3, on ? kLocked : kLampOff);
 }
 
+/// A letter stands in the middle, a word in the lower left corner.
+void DrawLabel(GrContext& context, Key const& key, GrRect const& face)
+{
+    auto const found = typed.find(key.vk);
+    auto const label = key.isLetter && found != typed.end() ? std::u16string(1, found->second) : LabelOf(key);
+    GrFont& font = key.isLetter ? *fonts->letters : *fonts->words;
+    auto const width = static_cast<int>(font.GetTextWidthW(
+        reinterpret_cast<unsigned short const*>(label.data()), static_cast<unsigned>(label.size())));
+    int const height = static_cast<int>(font.GetHeight()), ascent = static_cast<int>(font.GetAscent());
+    if (key.isLetter)
+        Write(context, font, (face.x1 + face.x2 - width) / 2, (face.y1 + face.y2 - height) / 2 + ascent,
+            label, kInk);
+    else
+        Write(context, font, face.x1 + 1, face.y2 - height + ascent, label, kInk);
+}
+
 void DrawKey(GrContext& context, Key const& key)
 {
     bool const isHeld = held.contains(key.vk);
@@ -203,6 +147,7 @@ void DrawKey(GrContext& context, Key const& key)
         cap.x1 + unit / 3, cap.y1 + unit / 6 + sunk, cap.x2 - unit / 3, cap.y2 - unit * 2 / 3 + sunk};
     FillRounded(context, face, corner, colors.light);
     FillRounded(context, {face.x1, face.y1 + 1, face.x2, face.y2}, corner, colors.face);
+    DrawLabel(context, key, face);
     if (key.vk == 'f' || key.vk == 'j') {  // found by touch
         int const middle = (face.x1 + face.x2) / 2;
         context.SetForeColor(colors.side);
@@ -238,37 +183,64 @@ void Paint(GrEvent const& event)
         if (Touch(PixelsOf(key.place), event.rect)) DrawKey(*context, key);
     for (auto const& lock : kLocks)
         DrawLamp(*context, PixelsOf(lock.lamp), (locks & lock.flag) != 0);
+    int baseline = eventPlace.y1 + static_cast<int>(fonts->events->GetAscent());
+    for (auto const& line : events) {
+        Write(*context, *fonts->events, eventPlace.x1, baseline, line, kEventInk);
+        baseline += static_cast<int>(fonts->events->GetHeight());
+    }
     event.window->FreeContext(context);
 }
 
-void Print(GrEvent const& event)
+/// Adds an event to those below the keyboard.
+void List(std::string const& text)
+{
+    events.emplace_back(text.begin(), text.end());
+    int const lines = (eventPlace.y2 - eventPlace.y1) / static_cast<int>(fonts->events->GetHeight());
+    while (static_cast<int>(events.size()) > lines)
+        events.pop_front();
+    eventsAreNew = true;
+    std::puts(text.c_str());
+    std::fflush(stdout);
+}
+
+std::string Hex(unsigned number, int digits)
+{
+    std::string text;
+    while (digits-- > 0)
+        text += "0123456789ABCDEF"[number >> 4 * digits & 15];
+    return text;
+}
+
+void ListKey(GrEvent const& event)
 {
     static constexpr std::pair<std::uint32_t, char const*> kNames[] = {{GrModShift, " shift"},
         {GrModRightShift, " right-shift"}, {GrModCapsLock, " caps-lock"}, {GrModControl, " control"},
         {GrModAlt, " alt"}, {GrModRightAlt, " right-alt"}, {GrModNumLock, " num-lock"},
         {GrModScrollLock, " scroll-lock"}, {GrModInsert, " insert"}};
-    std::printf(
-        "%s vk %04X chars %u", event.type == GrEventKeyDown ? "down" : "up  ", event.vk, event.charCount);
+    std::string text = event.type == GrEventKeyDown ? "down" : "up  ";
+    text += " vk " + Hex(event.vk, 4) + " chars " + std::to_string(event.charCount);
     for (auto const character : std::span(event.chars).first(event.charCount))
-        std::printf(" U+%04X", character);
-    std::printf(" repeat %u modifiers %03X", event.repeat, event.modifiers);
+        text += " U+" + Hex(character, 4);
+    text += " repeat " + std::to_string(event.repeat) + " modifiers " + Hex(event.modifiers, 3);
     for (auto const& [flag, name] : kNames)
-        if (event.modifiers & flag) std::fputs(name, stdout);
-    std::printf(" window %s time %u\n", event.window ? "some" : "none", event.time);
-    std::fflush(stdout);
+        if (event.modifiers & flag) text += name;
+    text += event.window ? " window some time " : " window none time ";
+    text += std::to_string(event.time);
+    List(text);
 }
 
-void PrintLayout(char16_t const* name)
+void ListLayout(char16_t const* name)
 {
-    std::fputs("layout ", stdout);
-    for (; *name != 0; ++name)
-        std::putchar(static_cast<char>(*name));
-    std::puts("");
+    std::u16string_view const characters(name);
+    List("layout " + std::string(characters.begin(), characters.end()));
 }
 
 void OnWindowEvent(GrEvent const& event)
 {
-    if (event.type == GrEventLayoutChanged) PrintLayout(event.layoutName);
+    if (event.type != GrEventLayoutChanged) return;
+    typed.clear();
+    GrWindow::RootWindow()->Invalidate();
+    ListLayout(event.layoutName);
 }
 
 /// What the event changes in the picture is due for paint.
@@ -284,6 +256,8 @@ void Show(GrEvent const& event)
         held.erase(key);
     // A dead key gives a character that is none. The next key that gives characters has met it.
     if (pressed && event.charCount != 0) deadKey = event.chars[0] == 0 ? std::optional(key) : std::nullopt;
+    if (pressed && event.charCount != 0 && event.chars[0] > ' ')
+        typed[key] = static_cast<char16_t>(event.chars[event.charCount - 1]);
     // Events tell the locks as they were before.
     locks = event.modifiers & (GrModCapsLock | GrModNumLock | GrModScrollLock | GrModInsert);
     for (auto const& lock : kLocks)
@@ -306,15 +280,21 @@ int main(int, char** argv)
         return 1;
     }
     GrWindow::SetCallback(OnWindowEvent);
-    if (char16_t const* const name = GrGetKeyboardLayout()) PrintLayout(name);
     PlaceKeyboard(static_cast<int>(width), static_cast<int>(height));
+    if (char16_t const* const name = GrGetKeyboardLayout()) ListLayout(name);
     for (GrEvent event;;) {
+        // Who types fast does not wait for the picture.
+        if (eventsAreNew && !GrHasEvent()) {
+            GrWindow::RootWindow()->Invalidate(eventPlace);
+            eventsAreNew = false;
+        }
         if (!GrGetEvent(event, nullptr)) continue;
         if (event.type == GrEventPaint) Paint(event);
         if (event.type != GrEventKeyDown && event.type != GrEventKeyUp) continue;
-        Print(event);
+        ListKey(event);
         if (event.type == GrEventKeyUp && event.vk == GrVkEscape) break;
         Show(event);
     }
+    fonts.reset();
     GrDone();
 }

@@ -23,7 +23,8 @@ mode, locks and lights, terminal settings, text or graphics, switching between c
 is shown.
 
   --restore      run nothing; make a console usable that a program has left in a bad state: put it back to
-                 what the system's start gives. From another console, over the network, or blindly
+                 what the system's start gives. From another console, over the network, or blindly. If the
+                 shell there shows nothing of what is typed, once more in that shell
   --tty DEVICE   the console to restore, such as /dev/tty1; without it the one that is shown
   --help         show this
   --version      show the version

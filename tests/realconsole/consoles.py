@@ -1,7 +1,7 @@
 """Sits at a machine with shells on two of its consoles: goes to the other one and back while a program draws, and
-sees to it that the shell takes what is typed after each way in which a program can crash.
+sees to it that the shell takes what is typed after each way in which a program can crash, or die under a guardian.
 
-    consoles.py GALLERY FAULTY STATE KERNEL KEEP    programs, the folders of the kernel and for pictures and logs
+    consoles.py GALLERY FAULTY GUARDIAN STATE KERNEL KEEP    programs, folders of the kernel and for pictures, logs
 """
 
 import sys
@@ -11,7 +11,7 @@ from pathlib import Path
 import machine
 import picture
 
-ROWS = {2: "1234567890", 16: "qwertyuiop", 28: "\n", 30: "asdfghjkl", 44: "zxcvbnm,./", 57: " "}
+ROWS = {2: "1234567890-", 16: "qwertyuiop", 28: "\n", 30: "asdfghjkl;", 44: "zxcvbnm,./", 57: " "}
 KEYS = {character: code for first, row in ROWS.items() for code, character in enumerate(row, first)}
 CTRL, SHIFT, ALT, F1, F2 = 29, 42, 56, 59, 60
 KEY_SECONDS = 0.02
@@ -52,8 +52,8 @@ class User:
         self.type(f"echo {word} > /tmp/{word}\n")
         self.wait_for(f"grep -qsx {word} /tmp/{word}")
 
-    def start(self, program: str, how: str = "") -> None:
-        self.type(f"{program} {how}\n")
+    def start(self, program: str, how: str = "", guarded: bool = False) -> None:
+        self.type(f"{'tessella-run ' * guarded}{program} {how}\n")
         self.wait_for(HAS_TAKEN.format(state=self._state, program=program))
 
     def settled(self) -> picture.Picture:
@@ -98,12 +98,41 @@ class User:
         if self._real.run(self._state) != before:
             raise Wrong(f"the console has not been given back after a crash: {how}")
 
+    def die(self, signal: str, away: bool) -> None:
+        """Under the guardian, which has the last word: the program's end, and the console that was shown."""
+        before = self._real.run(self._state)
+        self.start("gallery", guarded=True)
+        if away:
+            self.go_to(2, CTRL, ALT, F2)
+        self._real.run(f"kill -{signal} $(pidof gallery)")
+        self.wait_for("! pidof tessella-run")
+        self.wait_for("grep -qx tty1 /sys/class/tty/tty0/active")
+        self.check_shell(f"{signal}{away}".lower())
+        if self._real.run(self._state) != before:
+            raise Wrong(f"the guardian has not given the console back after {signal}")
+
+    def restore(self) -> None:
+        before = self._real.run(self._state)
+        self.start("gallery")
+        self._real.run("kill -KILL $(pidof gallery)")
+        self.wait_for("! pidof gallery")
+        if self._real.run(self._state) == before:
+            raise Wrong("nothing is left behind that could be mended")
+        self._real.run("tessella-run --restore --tty /dev/tty1")
+        self.check_shell("restored")
+        # The shell has taken the terminal's settings for its own meanwhile, and goes back to them.
+        self.type("tessella-run --restore; echo mended > /tmp/mended\n")
+        self.wait_for("grep -qsx mended /tmp/mended")
+        self.check_shell("again")
+        if self._real.run(self._state) != before:
+            raise Wrong("the console is not as at the start")
+
 
 def main() -> int:
-    gallery, faulty, state, kernel, keep = map(Path, sys.argv[1:])
+    gallery, faulty, guardian, state, kernel, keep = map(Path, sys.argv[1:])
     try:
-        with machine.boot(16, [gallery, faulty, state], kernel, keep) as real:
-            real.run(f"{machine.PLUG_MOUSE}; ln -s {gallery} {faulty} /bin")
+        with machine.boot(16, [gallery, faulty, guardian, state], kernel, keep) as real:
+            real.run(f"{machine.PLUG_MOUSE}; ln -s {gallery} {faulty} {guardian} /bin")
             for console in (1, 2):
                 real.run(SHELL.format(console))
             user = User(real, state)
@@ -111,6 +140,10 @@ def main() -> int:
             user.leave_and_return()
             for how in ("key", "paint", "mouse", "away", "frozen"):
                 user.crash(how)
+            for signal in ("KILL", "SEGV", "ABRT", "TERM"):
+                user.die(signal, away=False)
+            user.die("KILL", away=True)
+            user.restore()
             picture.write_png(keep / "reported.png", real.screenshot())
     except (Wrong, machine.MachineError, machine.MissingPart, OSError) as error:
         print(f"realconsole.consoles: {error}", file=sys.stderr)

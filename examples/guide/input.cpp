@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <csignal>
 #include <cstdio>
 #include <memory>
 #include <string>
@@ -50,9 +51,14 @@ void OnMouse(GrEvent const& event)
     if (event.type == GrEventWheelDown) said += " Down!";
 }
 
-/// Another thread may use the library between these two calls, and wakes the loop with the second one.
+/// Another thread may use the library between grabbing and ungrabbing the input, which wakes the loop, too. The
+/// signal by which the kernel asks for another console is not for it.
 void Work()
 {
+    sigset_t switches;
+    sigemptyset(&switches);
+    sigaddset(&switches, SIGUSR2);
+    pthread_sigmask(SIG_BLOCK, &switches, nullptr);
     for (int percent = 10; percent <= 100 && !ending; percent += 10) {
         std::this_thread::sleep_for(std::chrono::milliseconds(20));
         GrGrabInput();

@@ -51,8 +51,8 @@ void OnMouse(GrEvent const& event)
     if (event.type == GrEventWheelDown) said += " Down!";
 }
 
-/// Another thread may use the library between grabbing and ungrabbing the input, which wakes the loop, too. The
-/// signal by which the kernel asks for another console is not for it.
+/// Another thread may use the library between grabbing and ungrabbing the input, which wakes the loop, too.
+/// The signal by which the kernel asks for another console is not for it.
 void Work()
 {
     sigset_t switches;

@@ -1,5 +1,5 @@
-// Two windows, one with a hole: a click raises a window, and dragging moves it. Escape ends. The pointer has no
-// picture here; button.cpp makes one.
+// Two windows, one with a hole: a click raises a window, and dragging moves it. Escape ends. The pointer
+// has no picture here; button.cpp makes one.
 #include <tessella.h>
 
 #include <cstdio>

@@ -11,8 +11,8 @@ import sys
 
 OURS = "tessella"
 CLOCK = "/process_time"  # how Google Benchmark marks the clock that main.cpp asks for
-GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "fills", "blits", "desktop", "figures", "archive",
-          "text", "built_in_font"]
+GROUPS = ["rectangles", "regions", "cuts", "windows", "pointer", "shadows", "fills", "blits", "desktop", "figures",
+          "archive", "text", "built_in_font"]
 
 # These merge with lists of bands that the library reports as damaged, each time with the call stack. They run
 # with the reports off, which leaves the work itself, and on; all other rows report nothing and run with

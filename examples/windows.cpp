@@ -1,13 +1,17 @@
 // Overlapping windows to play with: a click raises a window, dragging moves it, the wheel lowers and raises
 // it, a right click hides it. A click on the ground shows the hidden ones again, a right click there ends.
+// Keys can do it without a mouse: F10 turns the arrow yellow, and they move it and press its buttons.
 //
-// Each window paints a pattern of its own, and tally marks that tell how often it was asked to paint.
+// Each window paints a pattern of its own, and tally marks that tell how often it was asked to paint: for
+// itself, or for a shadow that falls on it.
 #include <tessella.h>
 
 #include <cstring>
 #include <iostream>
 #include <iterator>
 #include <memory>
+#include <tuple>
+#include <utility>
 #include <vector>
 
 namespace {
@@ -69,16 +73,18 @@ void Paint(GrEvent const& event)
     Pane& pane = PaneOf(window);
     ++pane.paints;
     GrContext* const context = window.GetContext();
+    GrRegion shape = window.region;
+    shape.Offset(-window.bounds.x1, -window.bounds.y1);
+    // The context reaches over the window's shadow, too.
+    if (window.shadow) context->SetClipRegion(shape);
     context->SetForeColor(pane.fore);
     context->SetBackColor(pane.back);
     context->SetPattern(pane.pattern, window.bounds.x1, window.bounds.y1, false);
     context->FillRegion(event.rect);
     context->SetPattern(kSolid, 0, 0, false);
     if (window.parent) {
-        GrRegion edge = Edge(window.region);
-        edge.Offset(-window.bounds.x1, -window.bounds.y1);
         context->SetForeColor(kInk);
-        context->FillRegion(edge);
+        context->FillRegion(Edge(shape));
     }
     DrawTally(*context, pane.paints, (window.bounds.x2 - window.bounds.x1) / 2);
     window.FreeContext(context);
@@ -127,21 +133,25 @@ void BuildWindows()
 {
     GrWindow& root = *GrWindow::RootWindow();
     for (int i = 0; i < 6; ++i)
-        Add(root, {40 + i * 70, 60 + i * 45, 260 + i * 70, 210 + i * 45});
+        Add(root, {40 + i * 70, 60 + i * 45, 260 + i * 70, 210 + i * 45}).SetShadowed(i % 2 != 0);
     GrWindow& family = Add(root, {60, 260, 330, 440});
     Add(family, {90, 310, 190, 400});
     GrWindow& child = Add(family, {170, 290, 400, 380});  // sticks out, and is cut
     Add(child, {190, 330, 270, 370});
-    Add(root, {380, 40, 400, 60}).SetWindowRegion(Ring(190));
     GrRegion corner = GrRect{0, 0, 200, 60};
     corner += GrRect{0, 60, 70, 180};
-    Add(root, {250, 270, 251, 271}).SetWindowRegion(corner);
+    for (auto const& [left, top, shape] :
+        {std::tuple{380, 40, Ring(190)}, std::tuple{250, 270, std::move(corner)}}) {
+        GrWindow& shaped = Add(root, {left, top, left + 1, top + 1});
+        shaped.SetWindowRegion(shape);
+        shaped.SetShadowed(true);
+    }
     for (auto const& pane : panes)
         pane->window->Show();
 }
 
 /// An arrow with its tip as the hot spot: '#' is ink, '.' paper, anything else is seen through.
-std::unique_ptr<GrCursor> MakeArrow()
+std::unique_ptr<GrCursor> MakeArrow(GrColor paper)
 {
     static constexpr char const* kRows[] = {"#", "##", "#.#", "#..#", "#...#", "#....#", "#.....#",
         "#......#", "#.......#", "#........#", "#.....#####", "#..#..#", "#.# #..#", "##  #..#", "#    #..#",
@@ -151,11 +161,32 @@ std::unique_ptr<GrCursor> MakeArrow()
     for (int y = 0; y < height; ++y)
         for (int x = 0, end = static_cast<int>(std::strlen(kRows[y])); x < width; ++x) {
             char const dot = x < end ? kRows[y][x] : ' ';
-            GrColor const color = dot == '.' ? GrMakeColor(255, 255, 255) : dot == '#' ? kInk : 0;
+            GrColor const color = dot == '.' ? paper : dot == '#' ? kInk : 0;
             std::memcpy(image->pixels + (y * width + x) * 4, &color, 4);
             image->alphaPlane[y * width + x] = dot == ' ' ? 0 : 255;
         }
     return std::unique_ptr<GrCursor>(GrCursor::CreateInstance(image.release(), nullptr, 0, 0));
+}
+
+/// The arrow is white, and yellow while keys move it.
+struct Arrows {
+    std::unique_ptr<GrCursor> white = MakeArrow(GrMakeColor(255, 255, 255));
+    std::unique_ptr<GrCursor> yellow = MakeArrow(GrMakeColor(255, 208, 32));
+};
+
+void ShowArrow(void* arrows, bool movedByKeys)
+{
+    auto const& [white, yellow] = *static_cast<Arrows*>(arrows);
+    (movedByKeys ? yellow : white)->Activate();
+}
+
+/// What lies under a shadow is painted only if the shadow itself goes.
+void Lower(GrWindow& window)
+{
+    bool const hasShadow = window.shadow != nullptr;
+    window.SetShadowed(false);
+    window.Lower();
+    window.SetShadowed(hasShadow);
 }
 
 /// Brings a window, and the family that it belongs to, to the top.
@@ -176,8 +207,8 @@ int main(int, char** argv)
     }
     GrWindow::SetCallback(OnWindowEvent);
     BuildWindows();
-    auto const arrow = MakeArrow();
-    arrow->Activate();
+    Arrows arrows;
+    GrSetMouseEmulationNotify(ShowArrow, &arrows);
 
     GrWindow* dragged = nullptr;
     int grabX = 0, grabY = 0;  // where on it the pointer holds the dragged window
@@ -200,7 +231,7 @@ int main(int, char** argv)
         } else if (event.type == GrEventLeftUp) {
             dragged = nullptr;
         } else if (event.type == GrEventWheelDown && !onGround) {
-            window.Lower();
+            Lower(window);
         } else if (event.type == GrEventWheelUp) {
             window.Raise();
         } else if (event.type == GrEventRightDown && !onGround) {

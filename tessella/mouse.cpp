@@ -4,6 +4,7 @@
 #include <tessella/cursor_state.h>
 #include <tessella/event.h>
 #include <tessella/event_wait_l.h>
+#include <tessella/keyboard_device.h>
 #include <tessella/mouse_l.h>
 #include <tessella/screen.h>
 #include <tessella/screen_guard.h>
@@ -20,7 +21,6 @@
 
 constinit std::mutex mouseMutex;
 constinit std::atomic<std::uint32_t> mouseButtons{7};
-std::uint32_t emulatedButtons = 7;
 int mouseFd = -1;
 bool mouseWheel = false;
 constinit std::atomic<bool> mouseRefreshPending{false};
@@ -180,8 +180,8 @@ void GrMouseRefresh()
     if (!mouseRefreshPending) return;
     std::scoped_lock const lock(mouseMutex);
     bool const before = mouseEnabled;
-    mouseEnabled = mouseFd != -1;
-    if (mouseEnabled) StartMouseThread();
+    if (mouseFd != -1) StartMouseThread();
+    mouseEnabled = mouseFd != -1 || (sessionKeyboard && sessionKeyboard->emulationActive);
     if (mouseEnabled != before) OnMouseEnabledChanged();
     mouseRefreshPending = false;
 }

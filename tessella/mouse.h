@@ -12,9 +12,9 @@
 /// first mode is set, and the pointer put to its middle, before the mouse is started.
 extern std::mutex mouseMutex;
 
-/// Button states have a bit set while the button is up: 4 left, 2 middle, 1 right. All are up at the start.
-extern std::atomic<std::uint32_t> mouseButtons;  ///< as last reported, by whichever thread reports
-extern std::uint32_t emulatedButtons;            ///< as last reported by the keyboard
+/// The buttons as last reported, by whichever thread reports: a bit is set while the button is up, 4 left,
+/// 2 middle, 1 right. All are up at the start.
+extern std::atomic<std::uint32_t> mouseButtons;
 
 /// Where the pointer is, in screen coordinates, one past the edge at most. Changed under the mutex; read
 /// anywhere, where a value that is about to change does no harm.

@@ -197,6 +197,7 @@ void GrWindow::SetWindowRegion(GrRegion const& shape)
     region = shape;
     region.Offset(bounds.x1, bounds.y1);
     region.GetOuterRect(bounds);
+    if (shadow) *shadow = ShadowOf(region);
     flags &= ~GrWindowInvalidated;
     FullInvalidate(false);
     Send(GrEventWindowChanged, this, bounds);

@@ -25,15 +25,25 @@ void MakeValid(int x, int y)
     ValidRegion -= invalid;
 }
 
-/// Chooses the owner of the area's first point, cuts the area to what is seen of him, and fills in the event.
-void WalkPaint(GrRegion& area, GrEvent& event)
+/// Paints the window's shadow in the area, and leaves the window's own part.
+void PaintShadow(GrWindow& window, GrRegion& area)
+{
+    GrRegion shadowArea = area;
+    shadowArea &= *window.shadow;
+    window.DrawShadow(shadowArea);
+    if (window.shadow) area -= *window.shadow;  // a handler may have taken it away meanwhile
+}
+
+}
+
+void WalkPaint(GrRegion& area, GrEvent& event, bool markValid)
 {
     int x = 0, y = 0;
     area.GetSomePoint(x, y);
-    GrWindow* window = GrWindow::WindowAtXY(x, y, true);
+    GrWindow* window = GrWindow::WindowAtXY(x, y, markValid);
     if (!GR_ASSERT_TEXT(window, "window != 0")) window = &Screen;
     GrRegion clip;
-    window->DoGetClipRegion(clip, nullptr, false, true);
+    window->DoGetClipRegion(clip, nullptr, false, markValid);
     area &= clip;
     GR_ASSERT_TEXT(area, "reg");
 
@@ -42,9 +52,12 @@ void WalkPaint(GrRegion& area, GrEvent& event)
     for (GrWindow* ancestor = window->parent; ancestor; ancestor = ancestor->parent)
         ancestor->ResetInvalidated();
 
-    // Valid before it is painted: what the handler invalidates while it paints is not lost.
-    ValidRegion += area;
-    MakeValid(x, y);
+    if (markValid) {
+        // Valid before it is painted: what the handler invalidates while it paints is not lost.
+        ValidRegion += area;
+        MakeValid(x, y);
+        if (window->shadow) PaintShadow(*window, area);
+    }
 
     GrRect outer{};
     area.GetOuterRect(outer);
@@ -52,8 +65,6 @@ void WalkPaint(GrRegion& area, GrEvent& event)
         SeenFrom(outer.x2, window->bounds.x1), SeenFrom(outer.y2, window->bounds.y1)};
     event.window = window;
     event.type = GrEventPaint;
-}
-
 }
 
 bool GrWindow::IsInvalidated() const
@@ -108,7 +119,7 @@ bool GrWindow::GetPaintEvent(GrEvent* event, GrRegion& area)
 {
     area -= ValidRegion;
     if (!area) return false;
-    if (event) WalkPaint(area, *event);
+    if (event) WalkPaint(area, *event, true);
     return true;
 }
 

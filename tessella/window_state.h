@@ -1,5 +1,6 @@
 #pragma once
 
+#include <tessella/event.h>
 #include <tessella/window.h>
 
 // What all windows share. The application's thread only, like the tree itself.
@@ -15,3 +16,11 @@ extern void (*Callback)(GrEvent const&);
 
 /// The pixels of the screen that are up to date. All others within the root wait for paint.
 extern GrRegion ValidRegion;
+
+/// Chooses the owner of the area's first point, cuts the area to what is seen of him, and fills in the event.
+/// With `markValid` the area counts as valid from then on, and the owner's shadow in it is painted: it leaves
+/// the area. Otherwise there are no shadows, and nothing becomes valid. The area must not be empty.
+void WalkPaint(GrRegion& area, GrEvent& event, bool markValid);
+
+/// What a window of this shape casts, in the same coordinates.
+GrRegion ShadowOf(GrRegion const& shape);

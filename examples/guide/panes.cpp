@@ -23,6 +23,10 @@ void Paint(GrEvent const& event)
     GrWindow& window = *event.window;
     GrContext& context = *window.GetContext();
     if (auto const* const pane = static_cast<Pane*>(window.userData)) {
+        // The context lets through what is seen of the window and of its shadow.
+        GrRegion shape = window.region;
+        shape.Offset(-window.bounds.x1, -window.bounds.y1);
+        context.SetClipRegion(shape);
         Fill(context, event.rect, pane->color);
         int const right = window.bounds.x2 - window.bounds.x1;
         Fill(context, GrRect{0, 0, right, 16}, GrMakeColor(24, 24, 32));
@@ -85,6 +89,8 @@ int main()
         GrWindow plain(GrWindow::RootWindow(), 30, 20, 160, 120, &red);
         GrWindow frame(GrWindow::RootWindow(), 110, 70, 140, 110, &yellow);
         frame.SetWindowRegion(FrameShape());
+        plain.SetShadowed(true);
+        frame.SetShadowed(true);
         plain.Show();
         frame.Show();
         HandleEvents();

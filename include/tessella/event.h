@@ -9,8 +9,9 @@
 
 class GrWindow;
 
-/// Kinds of events. Those up to `GrEventKeyUp`, and `GrEventPaint`, come from `GrGetEvent`; paint comes from
-/// `GrWindow::Repaint`, too. The others go to the window callback only, on the thread of the operation.
+/// Kinds of events. Those up to `GrEventKeyUp`, and `GrEventPaint`, come from `GrGetEvent`; paint goes to
+/// the window callback, too, from `GrWindow::Repaint` and for shadows (`GrWindow::SetShadowed`). The others
+/// go to the window callback only, on the thread of the operation.
 enum : std::uint32_t {
     GrEventMouseMove = 1,          ///< the pointer has moved
     GrEventLeftDown = 2,           ///< the left button was pressed
@@ -69,6 +70,7 @@ struct GrEvent {
 };
 
 /// Takes the next event, in this order: paint, keys, mouse. Paint is looked for once, when the call begins.
+/// Keys may move the pointer instead of coming as keys (`GrSetMouseEmulationNotify`).
 /// If there is no event it waits, letting other threads have the library meanwhile (`GrGrabInput`).
 ///
 /// `timeout` limits the wait: null means no limit, and {0, 0} not to wait at all. Attention: `tv_usec` counts

@@ -90,3 +90,15 @@ GR_API char16_t const* GrGetKeyboardLayout();
 /// True if the kernel has taken the request, false without a keyboard or for a console that does not exist. A
 /// session does not let its console go yet: the request is then answered with no.
 GR_API bool SwitchToConsole(int number);
+
+/// Tells when the user starts and stops moving the pointer by keys, say to show it in another colour:
+/// `callback` is called at once with the present state, and then at each change, within `GrGetEvent`, on the
+/// application's thread. There is one callback; null takes it away. `user` is handed to it as it is. Does
+/// nothing before the session, when there is no keyboard.
+///
+/// F10 starts and stops it, and so do control-M, and num lock with the left shift and left alt; applications
+/// do not see these keys being pressed. Meanwhile they see no keys at all. The arrows and the numeric pad
+/// move the pointer, the faster the longer they are held. Blank, return, and enter and the centre of the pad
+/// are the left button, menu is the right one. A mouse goes on working; without one the pointer is in use
+/// only meanwhile.
+GR_API void GrSetMouseEmulationNotify(void (*callback)(void* user, bool active), void* user);

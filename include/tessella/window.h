@@ -41,7 +41,8 @@ public:
     GrRegion region;             ///< the exact shape
     GrRegion* shadow = nullptr;  ///< the shape of the shadow; null without one; owned by the window
 
-    /// The context that `GetContext` gives while the library has the window paint off screen; else null.
+    /// The context that `GetContext` gives while the library has the window paint off screen, into the image
+    /// of a shadow; else null.
     GrContext* context = nullptr;
     GrRegion reservedRegion;     ///< always empty
     std::uint32_t flags = 0;     ///< `GrWindowVisible` and the others
@@ -102,6 +103,7 @@ public:
     /// Puts the window on top of its siblings. What it gains is due for paint.
     void Raise();
     /// Puts the window below all its siblings. What it loses is due for paint by those that it uncovers.
+    /// Shadows do not count here: what they uncover stays as it is until something else has it painted.
     void Lower();
 
     /// Makes the window visible and all of it due for paint, and tells the callback (`GrEventWindowShown`).
@@ -124,13 +126,29 @@ public:
     /// one puts it to the screen's corner. Nothing on the root.
     void SetWindowRegion(GrRegion const& shape);
 
+    /// Has the window cast a shadow, 5 pixels to the right and downward, or not; nothing if it is so already.
+    /// What this changes is due for paint. The shadow goes where the window goes and has its shape; it lies
+    /// beyond the window, within the parent, and input passes through it. On the root it means nothing.
+    ///
+    /// The library paints shadows itself, whenever paint is asked for: it has the windows below paint off
+    /// screen, through the callback, darkens that and copies it to the screen. Such paint events are like any
+    /// other, except that `GetContext` gives a context over an image. The receiver must not destroy the
+    /// window, and finds colours and pattern of the context as others have left them. A window with nothing
+    /// but a shadow to paint still gets its event, with an empty rectangle.
+    void SetShadowed(bool shadowed);
+    /// Paints `area` (screen coordinates), a part of the shadow on the screen without gaps between its rows.
+    /// What it was is lost: it holds what did not lie to the right of the bounds, nor below them. A tool for
+    /// the library, which calls it when paint is asked for.
+    void DrawShadow(GrRegion& area);
+
     /// Writes the pixels of this window that nothing covers into `out`. Of its children, those above `stop`
     /// count as covering; with null, all. `fromValid` limits the result to what is valid; `withShadow` counts
     /// shadows in, the window's own as well as covering ones.
     void DoGetClipRegion(GrRegion& out, GrWindow const* stop, bool fromValid, bool withShadow);
 
-    /// A context with its origin at the window's corner, clipped to what is seen of the window now; later
-    /// changes of the tree do not reach it. Returned through `FreeContext`. It draws in the mode that it was
+    /// A context with its origin at the window's corner, clipped to what is seen now of the window and of its
+    /// own shadow: a window with both a shadow and a shape keeps to its `region` by itself. Later changes of
+    /// the tree do not reach the context. Returned through `FreeContext`. It draws in the mode that it was
     /// made in, and must not be used in another. Null before the first session.
     GrContext* GetContext();
     /// The same, with the area of the children included. Returned through `FreeContext`.

@@ -121,7 +121,7 @@ void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep,
     if (w < 1 || h < 1) return;
 
     LocalRegion const boxes;
-    if (sweep <= -kCircle || sweep >= kCircle) {
+    if (IsWholeTurn(sweep)) {
         boxes.Get() = GrRect{x, y, Moved(x, w), Moved(y, h)};  // all four quadrants
     } else {
         boxes.Get() = GrRect{};
@@ -130,7 +130,11 @@ void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep,
         MakeBoxes(boxes.Get(), arc, {x, y, w, h}, first, first + std::abs(sweep));
     }
     CutRegion(arc.region, boxes.Get(), clip);
+    WalkSetup(arc, x, y, w, h, base, stride);
+}
 
+void WalkSetup(GrArcState& arc, int x, int y, int w, int h, unsigned char* base, std::uint32_t stride)
+{
     auto const columns = static_cast<std::uint64_t>(w);
     auto const rows = static_cast<std::uint64_t>(h);
     bool const oddRows = rows % 2 != 0;

@@ -98,9 +98,16 @@ private:
     }
 };
 
+/// True if an arc goes all the way round, wherever it starts.
+constexpr bool IsWholeTurn(int sweep) { return sweep <= -360 * 64 || sweep >= 360 * 64; }
+
+/// Sets up the walk along the ellipse in the box of `w` by `h` pixels, which is not empty, at `x`, `y`, in
+/// surface coordinates, and nothing else of the arc. `base` is where the surface's row 0 begins.
+void WalkSetup(GrArcState& arc, int x, int y, int w, int h, unsigned char* base, std::uint32_t stride);
+
 /// Sets up the arc in the box of `w` by `h` pixels at `x`, `y`, in surface coordinates, from angle `start` on
-/// by `sweep`, in 64ths of a degree, anticlockwise. `base` is where the surface's row 0 begins. The region of
-/// an arc with an empty box is empty, and it has no wedges.
+/// by `sweep`, in 64ths of a degree, anticlockwise. The region of an arc with an empty box is empty, and it
+/// has no wedges.
 void ArcSetup(GrArcState& arc, int x, int y, int w, int h, int start, int sweep, unsigned char* base,
     std::uint32_t stride, GrRegion const& clip);
 
@@ -128,5 +135,5 @@ private:
 
 enum class Coverage { None, Part, All };
 
-/// How much of a rectangle, which is not empty, a region holds.
+/// How much of a rectangle a region holds; nothing of an empty one.
 Coverage CoverageOf(GrRect const& rect, GrRegion const& region);

@@ -123,9 +123,17 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     y = Moved(y, this->originY);
     w = Moved(w, 1);
     h = Moved(h, 1);
+    auto* const base = this->PixelBase();
+    auto const pitch = static_cast<std::uint32_t>(this->Stride());
     GrArcState arc;
-    ArcSetup(arc, x, y, w, h, start, sweep, this->PixelBase(), static_cast<std::uint32_t>(this->Stride()),
-        this->clip);
+    GrRect const box{x, y, Moved(x, w), Moved(y, h)};
+    if (IsWholeTurn(sweep) && this->IsSolid() && IsOneRectangle(this->clip) &&
+        CoverageOf(box, this->clip) == Coverage::All) {
+        typename S::Guard const guard(box);
+        WalkSetup(arc, x, y, w, h, base, pitch);
+        return DrawOutline(arc);
+    }
+    ArcSetup(arc, x, y, w, h, start, sweep, base, pitch, this->clip);
     GrRegion const& region = arc.region;
     if (!region) return;
     typename S::Guard const guard(region);
@@ -134,18 +142,65 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     for (int q = 0; q < 4; ++q)
         quadrants[q] = CoverageOf(QuadrantBox(q, x, y, w, h), region);
     auto const isWhole = [](Coverage coverage) { return coverage == Coverage::All; };
-    if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) {
-        WalkOutline(walk, [this, pixel = this->foreColor](int, std::uintptr_t address, int column, int) {
-            this->WritePixel(RowAt(address), column, pixel);
-        });
-        return;
-    }
+    if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) return DrawOutline(arc);
     WalkOutline(walk, [&](int quadrant, std::uintptr_t address, int column, int line) {
         Coverage const coverage = quadrants[quadrant];
         if (coverage == Coverage::All || (coverage == Coverage::Part && region.Contains(column, line)))
             this->PatternPixel(
                 RowAt(address), column, this->pattern[line & 7], this->patternTransparent, this->rasterMode);
     });
+}
+
+/// Paints the points of an ellipse that lies on the surface and within the clip, some in the middle twice.
+/// Where the next point is is as good as random, so masks decide it, and no branches.
+template <typename S>
+void GrGenericContextBase<S>::DrawOutline(GrArcState const& arc) const
+{
+    auto const pixel = this->foreColor;
+    std::int64_t const stepX = arc.stepX, stepY = arc.stepY;
+    std::ptrdiff_t const pitch = this->Stride();
+    std::int64_t decision = arc.decision;
+    std::int64_t nextSpan = arc.spanTerm - stepX;
+    std::int64_t nextRow = arc.rowTerm + stepY;
+    unsigned char* upper = this->PixelAddress(RowAt(arc.upperAddress), arc.left);
+    unsigned char* lower = this->PixelAddress(RowAt(arc.lowerAddress), arc.left);
+    std::ptrdiff_t reach = std::ptrdiff_t{arc.right} - arc.left;
+    auto const paint = [&] {
+        for (unsigned char* const address : {upper, lower}) {
+            this->WritePixel(address, 0, pixel);
+            this->WritePixel(address + reach * S::kBytes, 0, pixel);
+        }
+    };
+    // Steep: from point to point the rows move, and the columns may. Rows move only as long as a point of the
+    // next one lies within the ellipse, so the outline does not leave its box.
+    for (;;) {
+        paint();
+        if (reach < 2) return;
+        std::int64_t const inward = decision >> 63;
+        decision += nextSpan & inward;
+        nextSpan -= stepX & inward;
+        reach += 2 * inward;
+        upper += S::kBytes & inward;
+        lower += S::kBytes & inward;
+        if (decision < 0) break;
+        upper -= pitch;
+        lower += pitch;
+        decision -= nextRow;
+        nextRow += stepY;
+    }
+    // Flat, and never steep again: the columns move, and the rows may.
+    for (;;) {
+        paint();
+        if (reach < 2) return;
+        decision += nextSpan;
+        nextSpan -= stepX;
+        reach -= 2;
+        std::int64_t const outward = ~(decision >> 63);
+        decision -= nextRow & outward;
+        nextRow += stepY & outward;
+        upper += S::kBytes - (pitch & outward);
+        lower += S::kBytes + (pitch & outward);
+    }
 }
 
 /// Has the points of the ellipse painted, each with the quadrant that it lies in.

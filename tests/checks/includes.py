@@ -25,8 +25,9 @@ NEVER = [
     (r"tessella/(mouse|keyboard)_l.*", r"(include/)?tessella/(window|key_layout).*",
      "device threads push and wake"),
     (PUBLIC, rf"(?!{PUBLIC}|{CXX_LIBRARY}|<sys/time\.h>).*", "the boundary is the product"),
-    (r"examples/(?!gallery/).*", r"(?!include/tessella|<).*", "examples have what applications have"),
+    (r"examples/(guide/)?[^/]*", r"(?!include/tessella|<).*", "examples have what applications have"),
     (r"examples/gallery/.*", r"(?!include/tessella|examples/gallery/|<).*", "examples have what applications have"),
+    (r"examples/desktop/.*", r"(?!include/tessella|examples/desktop/|<).*", "examples have what applications have"),
     (r"(?!tests/).*", r"tests/.*", "production never knows its tests"),
 ]
 

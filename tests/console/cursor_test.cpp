@@ -1,5 +1,7 @@
 #include <support/on_console.h>
 #include <tessella.h>
+#include <tessella/cursor_state.h>
+#include <tessella/mouse.h>
 #include <tessella/screen_guard.h>
 
 #include <gtest/gtest.h>
@@ -44,6 +46,7 @@ public:
             MakeImage().release(), shape.masked ? CopyOf(*bits).release() : nullptr, shape.hotX, shape.hotY));
         look = MakeImage();
         cursor->Activate();
+        if (before) Compare();
     }
     void Deactivate()
     {
@@ -110,6 +113,9 @@ public:
                           wanted.pixels + static_cast<std::size_t>(y) * row, row),
                 0)
                 << "row " << y << ", pointer at " << pointerX << ", " << pointerY;
+        EXPECT_TRUE(std::all_of(GrScreen.fbMemory + GrScreen.height * GrScreen.stride,
+            GrScreen.fbMemory + GrScreen.fbLength, [](auto byte) { return byte == 0; }))
+            << "below the screen";
     }
 
 private:
@@ -197,11 +203,97 @@ TEST(Cursor, ComesBackAfterAChangeOfMode)
         desk.AwaitPointer();
         desk.ChangeMode();
         desk.Activate({10, 5, 5, true});
+        EXPECT_TRUE(cursorVisible) << "drawing has to know of it";
         desk.Compare();
         for (int i = 0; i < 40; ++i) {
             desk.FillSomewhere();
             desk.Compare();
         }
+    });
+}
+
+/// The byte at a place of an 8-bit screen is the square's, below.
+bool Shows(int x, int y)
+{
+    return GrScreen.fbMemory[static_cast<unsigned>(y) * GrScreen.stride + static_cast<unsigned>(x)] == 0xA5;
+}
+
+/// A square, from 4 left of and above the hot spot to 4 right of and below it. Whenever it is asked for
+/// something it counts whether the screen does not show it at a place.
+class Square : public GrCursor {
+public:
+    Square() : GrCursor(new GrImage(8, 8, 0), nullptr, 4, 4)
+    {
+        std::fill_n(image->pixels, 64, static_cast<unsigned char>(0xA5));
+    }
+    ~Square() override { Retire(); }
+    void DrawShape(GrContext* target, GrRect const& where, int sx, int sy) override
+    {
+        absent += !Shows(watchedX, watchedY);
+        target->DrawImageDirect(where, *image, sx, sy);
+    }
+    void RestoreRect(GrRect const& area) override
+    {
+        GrCursor::RestoreRect(area);
+        absent += !Shows(watchedX, watchedY);
+    }
+    int watchedX = 0, watchedY = 0, absent = 0;
+};
+
+TEST(Cursor, IsSeenInEveryFrameUnlessDrawingMeetsIt)
+{
+    OnConsole("96x64x8", nullptr, [](console::VirtualConsole& screen) {
+        Sizes sizes;
+        ASSERT_TRUE(Init(sizes));
+        GrScreen.context->FillRegion(GrRect{0, 0, kWidth, kHeight});
+        GrRect const beside{0, 0, 9, 9}, corner{50, 34, 60, 50};
+        auto square = std::make_unique<Square>(), other = std::make_unique<Square>();
+        square->Activate();
+        EXPECT_TRUE(Shows(44, 28) && Shows(51, 35) && !Shows(52, 35)) << "in the middle";
+        square->absent = 0;
+        for (int i = 0, x = 48, y = 32; i < 49; ++i) {
+            square->watchedX = x;
+            square->watchedY = y;
+            int const dx = i % 7 - 3, dy = (i + i / 7) % 7 - 3;
+            GrMouseReport(7, dx, dy, 0);
+            x += dx;
+            y += dy;
+        }
+        square->Activate();
+        EXPECT_EQ(square->absent, 0);
+        {
+            GrScreenGuard const guard(beside);
+            GrMouseReport(7, 3, 0, 0);
+            EXPECT_TRUE(Shows(44, 32) && !Shows(54, 32)) << "stands still while something is drawn";
+        }
+        EXPECT_TRUE(!Shows(44, 32) && Shows(54, 32)) << "goes where the pointer has gone";
+        for (int extended = 0; extended < 3; ++extended) {
+            GrScreenGuard const guard(extended ? GrRegion() : GrRegion(corner));
+            if (extended == 1) guard.Extend(corner);
+            if (extended == 2) guard.Extend(GrRegion(corner));
+            EXPECT_FALSE(Shows(47, 28));
+            GrScreen.context->SetForeColor(extended % 2 == 0 ? 0x00FF00 : 0x0000FF);
+            GrScreen.context->FillRegion(GrRect{40, 20, 50, 40});
+            GrHideCursor();
+            EXPECT_EQ(GrScreen.context->GetPixel(40, 20), GrScreen.context->GetPixel(49, 30)) << "was hidden";
+            EXPECT_FALSE(Shows(54, 35)) << "another guard has ended within";
+            other->Activate();
+            EXPECT_FALSE(Shows(54, 35));
+            other.swap(square);
+        }
+        EXPECT_TRUE(Shows(54, 35));
+        {
+            GrScreenGuard const guard(beside);
+            other->Activate();
+            EXPECT_TRUE(Shows(54, 35)) << "nobody draws but who has the guard";
+        }
+        other.reset();
+        EXPECT_EQ(currentCursor, nullptr);
+        screen.ChangeMode(*console::ParseMode("96x64x16"));
+        ASSERT_TRUE(GrChangeMode(sizes.width, sizes.height, sizes.depth, 0));
+        square->Activate();
+        EXPECT_EQ(currentCursor, nullptr) << "of another mode";
+        GrDone();
     });
 }
 

@@ -103,7 +103,8 @@ GrRegion Scattered(std::mt19937& random)
 PlainRegion const& Plain(GrRegion const& region) { return static_cast<PlainRegion const&>(region); }
 
 /// The steps of a clip, carried out with plain merges.
-void PlainClip(PlainRegion& out, GrWindow const& window, GrWindow const* stop, bool fromValid)
+void PlainClip(
+    PlainRegion& out, GrWindow const& window, GrWindow const* stop, bool fromValid, bool withShadow)
 {
     if (!window.IsVisible()) return out.Clear();
     if (!window.parent) {
@@ -112,11 +113,17 @@ void PlainClip(PlainRegion& out, GrWindow const& window, GrWindow const* stop, b
         else
             out = window.bounds;
     } else {
-        PlainClip(out, *window.parent, &window, fromValid);
-        out &= Plain(window.region);
+        PlainClip(out, *window.parent, &window, fromValid, withShadow);
+        PlainRegion extent;
+        extent = Plain(window.region);
+        if (withShadow && window.shadow) extent += Plain(*window.shadow);
+        out &= extent;
     }
     for (GrWindow const* child = window.first; child && child != stop && out; child = child->next)
-        if (child->IsVisible()) out -= Plain(child->region);
+        if (child->IsVisible()) {
+            out -= Plain(child->region);
+            if (withShadow && child->shadow) out -= Plain(*child->shadow);
+        }
 }
 
 TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
@@ -125,7 +132,12 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
         setenv("VELLUM_SAFE_ASSERT", "none", 1);  // merges with gaps report what they find
         Sizes sizes;
         ASSERT_TRUE(Init(sizes));
-        GrWindow::SetCallback([](GrEvent const&) {});
+        GrWindow::SetCallback([](GrEvent const& event) {  // paint is that of shadows
+            if (event.type != GrEventPaint) return;
+            GrContext* const context = event.window->GetContext();
+            context->FillRegion(GrRect{-99, -99, 99, 99});
+            event.window->FreeContext(context);
+        });
         std::mt19937 random(7);
         std::deque<GrWindow> windows;
         for (int i = 0; i < 8; ++i) {
@@ -137,18 +149,20 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
             for (GrWindow& window : windows) {
                 window.Move(static_cast<int>(random() % 30) - 5, static_cast<int>(random() % 30) - 5);
                 window.SetWindowRegion(Scattered(random));
+                window.SetShadowed(random() % 2 == 0);
                 if (random() % 2 == 0) window.Raise();
                 if (random() % 4 == 0) window.Lower();
             }
             GrEvent event;
             for (int events = 0; GrWindow::GetPaintEvent(nullptr); ++events) {
                 for (GrWindow& window : windows)
-                    for (bool const fromValid : {false, true}) {
+                    for (unsigned const flags : {0u, 1u, 2u, 3u}) {
+                        bool const fromValid = (flags & 1) != 0, withShadow = (flags & 2) != 0;
                         GrRegion clip;
                         PlainRegion plain;
                         GrWindow const* const stop = random() % 2 == 0 ? window.first : nullptr;
-                        window.DoGetClipRegion(clip, stop, fromValid, true);
-                        PlainClip(plain, window, stop, fromValid);
+                        window.DoGetClipRegion(clip, stop, fromValid, withShadow);
+                        PlainClip(plain, window, stop, fromValid, withShadow);
                         ASSERT_EQ(BandsText(clip), BandsText(plain));
                     }
                 GrRegion before = Screen.bounds;

@@ -9,6 +9,7 @@
 #include <chrono>
 #include <cstdlib>
 #include <cstring>
+#include <deque>
 #include <map>
 #include <memory>
 #include <random>
@@ -78,14 +79,23 @@ public:
     /// Paints as an application does, what the judge says is next.
     void PaintAsTold(GrEvent const& event)
     {
-        WindowJudge::Paint paint{};
-        EXPECT_TRUE(judge.NextPaint(paint));
+        if (told.empty()) std::ranges::copy(judge.NextPaint(), std::back_inserter(told));
+        ASSERT_FALSE(told.empty());
+        auto const paint = told.front();
+        told.pop_front();
+        GrWindow& window = *event.window;
         EXPECT_EQ(
-            Text(event.type, Number(event.window), event.rect), Text(GrEventPaint, paint.window, paint.rect));
-        GrContext* const context = event.window->GetContext();
+            Text(event.type, Number(&window), event.rect), Text(GrEventPaint, paint.window, paint.rect));
+        EXPECT_EQ(window.context != nullptr, paint.offScreen);
+        GrContext* const context = window.GetContext();
+        if (!judge.countPaints && window.parent) {  // its own shape, and nothing over its shadow
+            GrRegion shape = window.region;
+            shape.Offset(-window.bounds.x1, -window.bounds.y1);
+            context->SetClipRegion(shape);
+        }
         context->SetForeColor(paint.color);
         context->FillRegion(event.rect);
-        event.window->FreeContext(context);
+        window.FreeContext(context);
     }
 
 private:
@@ -105,7 +115,7 @@ private:
         if (windows.size() < 3 || (windows.size() < 12 && Pick(12) == 0)) return Create();
         int const i = PickWindow();
         GrWindow& window = Real(i);
-        switch (Pick(11)) {
+        switch (Pick(12)) {
         case 0:
             if (Pick(6) == 0 && judge[i].children.empty()) Destroy(i);
             break;
@@ -132,6 +142,12 @@ private:
         case 9: {
             GrRect const rect = PickRect(20);
             judge.Invalidate(i, &rect), window.Invalidate(rect);
+            break;
+        }
+        case 10: {
+            // The shape and the shadow of a lower one have rows between them.
+            bool const shadowed = judge[i].bounds.y2 - judge[i].bounds.y1 >= 5 && Pick(3) != 0;
+            judge.SetShadowed(i, shadowed), window.SetShadowed(shadowed);
             break;
         }
         default:
@@ -184,7 +200,7 @@ private:
     {
         int const left = Pick(7) - 3, top = Pick(7) - 3;
         GrRegion region;
-        for (int rows = 1 + Pick(12), y = top; y < top + rows; ++y) {
+        for (int rows = (judge[i].shadowed ? 5 : 1) + Pick(12), y = top; y < top + rows; ++y) {
             int const a = left + Pick(6), b = a + 1 + Pick(12), c = b + 1 + Pick(4);
             region += GrRect{a, y, b, y + 1};
             if (Pick(2) == 0) region += GrRect{c, y, c + 1 + Pick(8), y + 1};
@@ -231,8 +247,11 @@ private:
             return false;
         }
         GrEvent event;
+        painter = this;
         EXPECT_TRUE(GrHasEvent() && GrGetEvent(event, &noWait));
         PaintAsTold(event);
+        painter = nullptr;
+        EXPECT_TRUE(told.empty());
         return true;
     }
 
@@ -250,12 +269,30 @@ private:
         while (TakePaint() && !testing::Test::HasFailure()) {
         }
         CheckValidAndFlags();
-        for (std::size_t i = 0; i < judge.screen.size(); ++i) {
+        CheckScreen(judge.screen);
+        CheckMouse();
+        if (Pick(3) == 0) CheckAnew();
+    }
+
+    /// Painted anew, nothing stale remains: the screen is what the tree says.
+    void CheckAnew()
+    {
+        judge.countPaints = false;
+        judge.FullInvalidate(0, true), GrWindow::RootWindow()->FullInvalidate(true);
+        while (TakePaint() && !testing::Test::HasFailure()) {
+        }
+        judge.screen = judge.Picture();
+        CheckScreen(judge.screen);
+        judge.countPaints = true;
+    }
+
+    void CheckScreen(std::vector<std::uint32_t> const& wantedScreen)
+    {
+        for (std::size_t i = 0; i < wantedScreen.size(); ++i) {
             std::uint32_t pixel = 0;
             std::memcpy(&pixel, GrScreen.fbMemory + i * 4, 4);
-            ASSERT_EQ(pixel, judge.screen[i]) << "pixel " << i % kWidth << ", " << i / kWidth;
+            ASSERT_EQ(pixel, wantedScreen[i]) << "pixel " << i % kWidth << ", " << i / kWidth;
         }
-        CheckMouse();
     }
 
     void CheckValidAndFlags()
@@ -265,7 +302,10 @@ private:
                 ASSERT_EQ(ValidRegion.Contains(x, y), judge.valid[static_cast<std::size_t>(y * kWidth + x)])
                     << x << ", " << y;
         for (auto const& [i, window] : windows)
-            ASSERT_EQ(window->flags, (judge[i].visible ? 1u : 0u) | (judge[i].invalidated ? 4u : 0u)) << i;
+            ASSERT_EQ(window->flags,
+                (judge[i].visible ? 1u : 0u) | (judge[i].invalidated ? 4u : 0u) |
+                    (judge[i].shadowed ? 8u : 0u))
+                << i;
     }
 
     /// Nothing is due for paint, so all events are the mouse's.
@@ -282,7 +322,7 @@ private:
         GrEvent event;
         while (GrGetEvent(event, &noWait)) {
             bool const inside = event.x < kWidth && event.y < kHeight;
-            ASSERT_EQ(Number(event.window), inside ? judge.At(event.x, event.y) : 0);
+            ASSERT_EQ(Number(event.window), inside ? judge.At(event.x, event.y, false) : 0);
             ASSERT_LE(event.type, GrEventWheelDown);
         }
     }
@@ -291,6 +331,7 @@ private:
     std::mt19937 random;
     WindowJudge judge{kWidth, kHeight};
     std::map<int, std::unique_ptr<GrWindow>> windows;
+    std::deque<WindowJudge::Paint> told;  // what the judge has said already
     std::string wanted;
     int pointerX = kWidth / 2, pointerY = kHeight / 2;
 };

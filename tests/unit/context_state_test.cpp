@@ -2,6 +2,7 @@
 #include <tessella/event_wait_l.h>
 #include <tessella/image.h>
 #include <tessella/mouse.h>
+#include <tessella/mouse_emulation.h>
 #include <tessella/pixel/screen_base.h>
 #include <tessella/pixel/surface.h>
 #include <tessella/screen_guard.h>

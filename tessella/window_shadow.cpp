@@ -1,0 +1,120 @@
+#include <tessella/window_state.h>
+
+#include <tessella/coordinates.h>
+#include <tessella/image.h>
+#include <tessella/screen.h>
+
+#include <memory>
+#include <utility>
+
+// A shadow is a dark copy of what lies under it. There is no transparency in the tree, so the windows below
+// paint what is to be seen of them into an image, which is darkened and put on the screen. Their handlers
+// notice nothing: the image's context is what they get for their window's.
+
+namespace {
+
+constexpr int kShadowOffset = 5;  // to the right, and downward
+constexpr std::uint8_t kShadowAlpha = 40;
+
+/// Has a window paint off screen while it lives.
+class OffScreen {
+public:
+    OffScreen(GrWindow& window, GrContext* context)
+        : painted(window), before(std::exchange(window.context, context))
+    {}
+    OffScreen(OffScreen const&) = delete;
+    OffScreen& operator=(OffScreen const&) = delete;
+    ~OffScreen() { painted.context = before; }
+
+private:
+    GrWindow& painted;
+    GrContext* const before;  // not null if the window's handler has asked for paint within a pass
+};
+
+/// Has each window that is seen in `area`, shadows aside, paint its part of it into the image behind
+/// `context`, which stands for the screen's rectangle `rect`.
+void PaintBelow(GrContextI& context, GrRect const& rect, GrRegion const& area)
+{
+    GrRegion rest = area;
+    while (rest) {
+        int x = 0, y = 0;
+        rest.GetSomePoint(x, y);
+        GrRegion part = rest;
+        GrEvent event;
+        WalkPaint(part, event, false);
+        GrWindow& window = *event.window;
+        int const left = window.bounds.x1, top = window.bounds.y1;
+        part.Offset(-left, -top);
+        context.SetBaseOrigin(SeenFrom(left, rect.x1), SeenFrom(top, rect.y1));
+        context.SetLimitRegion(part);
+        if (Callback) {
+            OffScreen const pass(window, &context);
+            Callback(event);
+        }
+        part.Offset(left, top);
+        rest -= part;
+        // Shapes with gaps between their rows may own a point that their clip leaves out.
+        if (rest.Contains(x, y)) rest -= GrRect{x, y, x + 1, y + 1};
+    }
+}
+
+/// Paints the shadow in `area`, which lies in `rect`.
+void PaintShadowRect(GrRect const& rect, GrRegion const& area)
+{
+    if (!area || !GrScreen.context) return;
+    GrImage image(SeenFrom(rect.x2, rect.x1), SeenFrom(rect.y2, rect.y1), 0);
+    // What is made for an image is a context of images.
+    std::unique_ptr<GrContextI> const context(static_cast<GrContextI*>(GrScreen.createImageContext(&image)));
+    PaintBelow(*context, rect, area);
+
+    context->SetBaseOrigin(SeenFrom(0, rect.x1), SeenFrom(0, rect.y1));
+    context->SetLimitRegion(area);
+    context->SetForeColor(0);
+    context->FillRegionAlpha(rect, kShadowAlpha);
+
+    GrScreen.context->SetClipRegion(area);
+    GrScreen.context->DrawImage(rect, image, 0, 0);
+    GrScreen.context->ResetClipRegion();
+}
+
+}
+
+GrRegion ShadowOf(GrRegion const& shape)
+{
+    GrRegion shadow = shape;
+    shadow.Offset(kShadowOffset, kShadowOffset);
+    shadow -= shape;
+    return shadow;
+}
+
+void GrWindow::SetShadowed(bool shadowed)
+{
+    if (shadowed == (shadow != nullptr)) return;
+    if (shadowed) {
+        shadow = new GrRegion(ShadowOf(region));
+        flags |= GrWindowShadowed;
+        flags &= ~GrWindowInvalidated;
+        FullInvalidate(false);
+    } else {
+        FullInvalidate(false);
+        delete std::exchange(shadow, nullptr);
+        flags &= ~GrWindowShadowed;
+    }
+}
+
+// A window that is a rectangle has an L for a shadow. Each of its strips gets an image of its own, so that
+// none is as large as the window.
+void GrWindow::DrawShadow(GrRegion& area)
+{
+    GrRect const moved = Moved(bounds, kShadowOffset, kShadowOffset);
+    for (GrRect const& strip :
+        {GrRect{bounds.x2, moved.y1, moved.x2, bounds.y2}, GrRect{moved.x1, bounds.y2, moved.x2, moved.y2}}) {
+        GrRegion part = area;
+        part &= strip;
+        PaintShadowRect(strip, part);
+        area -= part;
+    }
+    GrRect rest{};
+    area.GetOuterRect(rest);
+    PaintShadowRect(rest, area);
+}

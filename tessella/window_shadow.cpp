@@ -4,6 +4,7 @@
 #include <tessella/image.h>
 #include <tessella/screen.h>
 
+#include <algorithm>
 #include <memory>
 #include <utility>
 
@@ -31,6 +32,19 @@ private:
     GrContext* const before;  // not null if the window's handler has asked for paint within a pass
 };
 
+/// Leaves what comes behind the point, from top to bottom and from left to right.
+void DropUpTo(GrRegion& region, int x, int y)
+{
+    GrRect outer{};
+    region.GetOuterRect(outer);
+    // Between rows with gaps the operators may leave or lose pixels. What is cut out of a rectangle has none.
+    GrRegion missing = outer;
+    missing -= region;
+    region = GrRect{outer.x1, y, outer.x2, outer.y2};
+    region -= GrRect{outer.x1, y, x + 1, y + 1};
+    region -= missing;
+}
+
 /// Has each window that is seen in `area`, shadows aside, paint its part of it into the image behind
 /// `context`, which stands for the screen's rectangle `rect`.
 void PaintBelow(GrContextI& context, GrRect const& rect, GrRegion const& area)
@@ -54,27 +68,45 @@ void PaintBelow(GrContextI& context, GrRect const& rect, GrRegion const& area)
         part.Offset(left, top);
         rest -= part;
         // Shapes with gaps between their rows may own a point that their clip leaves out.
-        if (rest.Contains(x, y)) rest -= GrRect{x, y, x + 1, y + 1};
+        int nextX = 0, nextY = 0;
+        rest.GetSomePoint(nextX, nextY);
+        if (rest && std::pair(nextY, nextX) <= std::pair(y, x)) DropUpTo(rest, x, y);
     }
 }
 
+/// Limits the screen's own context while it lives.
+class ScreenClip {
+public:
+    ScreenClip(GrContext& screen, GrRegion const& area) : context(screen) { context.SetClipRegion(area); }
+    ScreenClip(ScreenClip const&) = delete;
+    ScreenClip& operator=(ScreenClip const&) = delete;
+    ~ScreenClip() { context.ResetClipRegion(); }
+
+private:
+    GrContext& context;
+};
+
 /// Paints the shadow in `area`, which lies in `rect`.
-void PaintShadowRect(GrRect const& rect, GrRegion const& area)
+void PaintShadowRect(GrRect const& wholeRect, GrRegion const& area)
 {
     if (!area || !GrScreen.context) return;
+    // Windows may be far larger than the screen. The corner stays: patterns are aligned with it.
+    GrRect const rect{wholeRect.x1, wholeRect.y1, std::min(wholeRect.x2, Screen.bounds.x2),
+        std::min(wholeRect.y2, Screen.bounds.y2)};
+    if (rect.IsEmpty()) return;
     GrImage image(SeenFrom(rect.x2, rect.x1), SeenFrom(rect.y2, rect.y1), 0);
     // What is made for an image is a context of images.
     std::unique_ptr<GrContextI> const context(static_cast<GrContextI*>(GrScreen.createImageContext(&image)));
     PaintBelow(*context, rect, area);
+    if (!GrScreen.context) return;  // a handler has ended the session or lost the mode
 
     context->SetBaseOrigin(SeenFrom(0, rect.x1), SeenFrom(0, rect.y1));
     context->SetLimitRegion(area);
     context->SetForeColor(0);
     context->FillRegionAlpha(rect, kShadowAlpha);
 
-    GrScreen.context->SetClipRegion(area);
+    ScreenClip const clip(*GrScreen.context, area);
     GrScreen.context->DrawImage(rect, image, 0, 0);
-    GrScreen.context->ResetClipRegion();
 }
 
 }

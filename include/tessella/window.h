@@ -24,9 +24,9 @@ enum : std::uint32_t {
 /// records. It runs on the calling thread, in the midst of the operations that say so.
 ///
 /// Among siblings, earlier in the list means closer to the viewer. A window is seen within its parent only,
-/// and a parent's pixels are those that its children leave. Coordinates are screen coordinates, also those
-/// of children, except where an operation says *window coordinates*: they count from `bounds.x1`,
-/// `bounds.y1`.
+/// and on its parent's shadow; a parent's pixels are those that its children leave. Coordinates are screen
+/// coordinates, also those of children, except where an operation says *window coordinates*: they count from
+/// `bounds.x1`, `bounds.y1`.
 ///
 /// Nothing is painted at once. What a change uncovers or alters is *invalid*, and `GrGetEvent` hands it out
 /// as paint events, from the top of the screen downward, one a window.
@@ -72,6 +72,7 @@ public:
     static GrWindow* WindowAtXY(int x, int y, bool withShadow);
 
     /// Finds the next area that is due for paint and takes it for valid from now on, so the caller paints it.
+    /// Shadows in it are painted at once, which runs the callback.
     /// `event` becomes a paint event. With null, only tells whether anything is due. False if nothing is, or
     /// while the console shows somebody else's screen.
     static bool GetPaintEvent(GrEvent* event);
@@ -132,9 +133,10 @@ public:
     ///
     /// The library paints shadows itself, whenever paint is asked for: it has the windows below paint off
     /// screen, through the callback, darkens that and copies it to the screen. Such paint events are like any
-    /// other, except that `GetContext` gives a context over an image. The receiver must not destroy the
-    /// window, and finds colours and pattern of the context as others have left them. A window with nothing
-    /// but a shadow to paint still gets its event, with an empty rectangle.
+    /// other, except that `GetContext` gives a context over an image, which goes when the receiver has
+    /// returned. The receiver must not destroy any window nor ask for paint meanwhile, and finds colours,
+    /// pattern and raster mode of the context as others have left them. A window with nothing but a shadow to
+    /// paint still gets its event, with an empty rectangle.
     void SetShadowed(bool shadowed);
     /// Paints `area` (screen coordinates), a part of the shadow on the screen without gaps between its rows.
     /// What it was is lost: it holds what did not lie to the right of the bounds, nor below them. A tool for
@@ -147,11 +149,12 @@ public:
     void DoGetClipRegion(GrRegion& out, GrWindow const* stop, bool fromValid, bool withShadow);
 
     /// A context with its origin at the window's corner, clipped to what is seen now of the window and of its
-    /// own shadow: a window with both a shadow and a shape keeps to its `region` by itself. Later changes of
+    /// own shadow: a window with a shadow keeps to its `region` by itself. Later changes of
     /// the tree do not reach the context. Returned through `FreeContext`. It draws in the mode that it was
     /// made in, and must not be used in another. Null before the first session.
     GrContext* GetContext();
-    /// The same, with the area of the children included. Returned through `FreeContext`.
+    /// The same with the area of the children included, and of all shadows, which do not count here. Never a
+    /// context over an image: what is drawn goes to the screen. Returned through `FreeContext`.
     GrContext* GetNonclipContext();
     /// Takes back a context of this window; null is allowed.
     void FreeContext(GrContext* freed) const;

@@ -152,7 +152,15 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
                 window.SetShadowed(random() % 2 == 0);
                 if (random() % 2 == 0) window.Raise();
                 if (random() % 4 == 0) window.Lower();
+                if (!window.shadow) continue;
+                PlainRegion shadow;
+                shadow = Plain(window.region);
+                shadow.Offset(5, 5);
+                shadow -= Plain(window.region);
+                ASSERT_EQ(BandsText(*window.shadow), BandsText(shadow));
             }
+            GrRegion anywhere = Scattered(random);
+            windows[0].DrawShadow(anywhere);  // comes to an end
             GrEvent event;
             for (int events = 0; GrWindow::GetPaintEvent(nullptr); ++events) {
                 for (GrWindow& window : windows)
@@ -178,6 +186,29 @@ TEST(Windows, ShapesWithGapsGetTheirPaintAndTheStatedBands)
         }
         while (!windows.empty())
             windows.pop_back();
+        GrDone();
+    });
+}
+
+TEST(Windows, AHandlerThatThrowsInAShadowLeavesTheScreenUsable)
+{
+    OnConsole("40x36x16", nullptr, [](console::VirtualConsole& virtualConsole) {
+        Sizes sizes;
+        ASSERT_TRUE(Init(sizes));
+        GrWindow::SetCallback([](GrEvent const& event) {
+            if (event.type == GrEventPaint && event.window == GrWindow::RootWindow()) throw std::bad_alloc();
+        });
+        GrWindow window(GrWindow::RootWindow(), 4, 4, 2000000000, 20, nullptr);
+        window.SetShadowed(true);
+        window.Show();
+        GrEvent event;
+        EXPECT_THROW(while (GrWindow::GetPaintEvent(&event)), std::bad_alloc);
+        EXPECT_EQ(GrWindow::RootWindow()->context, nullptr);
+        GrScreen.context->SetForeColor(GrMakeColor(255, 255, 255));
+        GrScreen.context->FillRegion(GrRect{0, 0, 40, 36});
+        EXPECT_EQ(virtualConsole.Screen().At(0, 0), 0xFFFFFFu);
+        GrWindow::SetCallback([](GrEvent const&) {});
+        window.Hide();
         GrDone();
     });
 }

@@ -1,7 +1,11 @@
 #include <console/framebuffer_model.h>
 
+#include <algorithm>
+#include <array>
 #include <cerrno>
 #include <cstring>
+
+#include <unistd.h>
 
 namespace console {
 
@@ -65,6 +69,19 @@ int FramebufferModel::PutColourMap(fb_cmap const& map)
         own.blue[map.start + i] = map.blue[i];
     }
     return 0;
+}
+
+void FramebufferModel::ShowConsole(int console) const
+{
+    FileIdentity identity;
+    if (!Identify(state.framebufferFd, identity) || identity != state.framebuffer) return;
+    std::array<unsigned char, 4096> colour{};
+    colour.fill(static_cast<unsigned char>(0x55 + console));
+    std::size_t const end = std::size_t{state.mode.pitch} * state.mode.height;
+    for (std::size_t at = 0; at < end; at += colour.size())
+        if (pwrite(state.framebufferFd, colour.data(), std::min(colour.size(), end - at),
+                static_cast<off_t>(at)) == -1)
+            return;
 }
 
 int FramebufferModel::GetColourMap(fb_cmap const& map) const

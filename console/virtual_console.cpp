@@ -69,6 +69,7 @@ void VirtualConsole::MakeFramebuffer()
     Checked(ftruncate(fd, kVideoMemory), "making video memory");
     Checked(fcntl(fd, F_ADD_SEALS, F_SEAL_SHRINK | F_SEAL_GROW), "making video memory");
     pixels = OwnedMapping(fd, kVideoMemory, OwnedMapping::Access::Read, "making video memory");
+    state->framebufferFd = fd;
     std::snprintf(state->framebufferPath.data(), state->framebufferPath.size(), "/proc/self/fd/%d", fd);
     state->framebuffer = IdentityOf(fd);
 }

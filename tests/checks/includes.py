@@ -11,7 +11,8 @@ PUBLIC = r"include/tessella(\.h|/.*)"
 NEVER = [
     (r"(include/)?(common|file)/.*|(xml|bundle)/.*", r"(include/)?tessella[./].*",
      "the foundation builds and is tested without graphics"),
-    (r"(include|tessella|xml|bundle|examples)/.*(?<!_l)\.\w+", DEVICE,
+    # An application's thread blocks a signal there.
+    (r"(include|tessella|xml|bundle|examples)/(?!guide/input\.).*(?<!_l)\.\w+", DEVICE,
      "logic runs on a machine without a console"),
     (r"(include/)?tessella/region.*",
      rf"(?!include/tessella/(region|types|export)\.h|tessella/coordinates\.h|include/common/assert\.h"
@@ -24,11 +25,9 @@ NEVER = [
     (r"tessella/(mouse|keyboard)_l.*", r"(include/)?tessella/(window|key_layout).*",
      "device threads push and wake"),
     (PUBLIC, rf"(?!{PUBLIC}|{CXX_LIBRARY}|<sys/time\.h>).*", "the boundary is the product"),
-    (r"examples/[^/]+", r"(?!include/tessella|<).*", "examples have what applications have"),
-    (r"examples/gallery/.*", r"(?!include/tessella|examples/gallery/|<).*", "examples have what applications have"),
-    (r"examples/keys/.*", r"(?!include/tessella|examples/keys/|<).*", "examples have what applications have"),
-    (r"examples/text/.*", r"(?!include/tessella|examples/text/|<).*", "examples have what applications have"),
-    (r"examples/desktop/.*", r"(?!include/tessella|examples/desktop/|<).*", "examples have what applications have"),
+    *((rf"examples/{one}/.*", rf"(?!include/tessella|examples/{one}/|<).*", "examples have what applications have")
+      for one in ("gallery", "keys", "text", "desktop")),
+    (r"examples/(guide/)?[^/]*", r"(?!include/tessella|<).*", "examples have what applications have"),
     (r"(?!tests/).*", r"tests/.*", "production never knows its tests"),
 ]
 

@@ -92,9 +92,7 @@ private:
 
     void FillRange(GrRange const& columns, GrRange const& rows)
     {
-        context.FillRows({context.PixelAddress(context.RowAddress(rows.r1), columns.r1), context.Stride(),
-                             columns.r2 - columns.r1, rows.r2 - rows.r1},
-            context.backColor);
+        context.FillRange(columns, rows, context.backColor);
     }
 
     GrGenericContextBase& context;
@@ -118,7 +116,8 @@ void GrGenericContextBase<S>::DrawCharacters(
     int const top = SeenFrom(baseline, static_cast<int>(font.GetAscent()));
 
     typename S::TextGuard const guard(*this);
-    bool const gapsLast = !transparent && (bold || !GoesForward(font, text, length));
+    // Where pixels are not packed, a store may reach others of its byte, so that the order is seen.
+    bool const gapsLast = !transparent && (!S::kPacked || bold || !GoesForward(font, text, length));
     TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), gapsLast);
     GrGlyphInfo glyph;
     unsigned previous = 0;

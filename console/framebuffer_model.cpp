@@ -7,6 +7,7 @@ namespace console {
 
 namespace {
 
+constexpr unsigned long kVgaWindow = 0xA0000;
 constexpr unsigned long kPhysicalAddress = 0xFD000000;  // nothing maps it; where adapters tend to lie
 
 fb_bitfield BitField(ColourField field) { return {field.offset, field.length, 0}; }
@@ -23,17 +24,35 @@ int CheckMap(fb_cmap const& map)
 
 std::size_t FramebufferModel::MemoryLength(DisplayMode const& mode)
 {
-    return std::size_t{2} * mode.pitch * mode.height;
+    return mode.depth == 4 ? VgaModel::kWindow : std::size_t{2} * mode.pitch * mode.height;
 }
 
 fb_fix_screeninfo FramebufferModel::FixedInfo() const
 {
     fb_fix_screeninfo info{};
+    if (state.mode.depth == 4) return PlanarFixedInfo();
     std::strcpy(info.id, "VESA VGA");
     info.smem_start = kPhysicalAddress;
     info.smem_len = static_cast<unsigned>(MemoryLength(state.mode));
     info.type = FB_TYPE_PACKED_PIXELS;
     info.visual = state.format.bits <= 8 ? FB_VISUAL_PSEUDOCOLOR : FB_VISUAL_TRUECOLOR;
+    info.line_length = state.mode.pitch;
+    info.accel = FB_ACCEL_NONE;
+    return info;
+}
+
+/// As the kernel's driver for the 16-colour modes tells it.
+fb_fix_screeninfo FramebufferModel::PlanarFixedInfo() const
+{
+    fb_fix_screeninfo info{};
+    std::strcpy(info.id, "VGA16 VGA");
+    info.smem_start = kVgaWindow;
+    info.smem_len = VgaModel::kWindow;
+    info.type = FB_TYPE_VGA_PLANES;
+    info.type_aux = FB_AUX_VGA_PLANES_VGA4;
+    info.visual = FB_VISUAL_PSEUDOCOLOR;
+    info.xpanstep = 8;
+    info.ypanstep = 1;
     info.line_length = state.mode.pitch;
     info.accel = FB_ACCEL_NONE;
     return info;

@@ -7,6 +7,7 @@
 
 #include <bit>
 #include <cerrno>
+#include <ctime>
 
 #include <fcntl.h>
 #include <sys/mman.h>
@@ -111,6 +112,18 @@ int Answer(State& state, RequestInfo const& info, void* argument)
     return FramebufferModel(state).Answer(info.request, argument);
 }
 
+/// Waits until a console is shown, or a signal's handler has run.
+int AwaitConsole(State& state, void* console)
+{
+    constexpr timespec glance{0, 2'000'000};
+    for (;;) {
+        if (nanosleep(&glance, nullptr) == -1) return EINTR;
+        StateLock const lock(state);
+        int const error = TtyModel(state).Answer(Request::AwaitConsole, console);
+        if (error != EAGAIN) return error;
+    }
+}
+
 }
 
 void Attach(State* state)
@@ -143,7 +156,9 @@ std::optional<int> ControlDevice(int fd, unsigned long number, void* argument)
     auto const* const info = FindIoctl(number);
     if (info == nullptr) return std::nullopt;
     if (!Is(fd, info->device == Device::Tty ? state->tty : state->framebuffer)) return std::nullopt;
-    return Result(Answer(*state, *info, argument));
+    int const error = Answer(*state, *info, argument);
+    bool const mustWait = error == EAGAIN && info->request == Request::AwaitConsole;
+    return Result(mustWait ? AwaitConsole(*state, argument) : error);
 }
 
 std::optional<ssize_t> WriteDevice(int fd, void const* data, std::size_t length)

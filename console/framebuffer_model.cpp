@@ -1,7 +1,11 @@
 #include <console/framebuffer_model.h>
 
+#include <algorithm>
+#include <array>
 #include <cerrno>
 #include <cstring>
+
+#include <unistd.h>
 
 namespace console {
 
@@ -84,6 +88,21 @@ int FramebufferModel::PutColourMap(fb_cmap const& map)
         own.blue[map.start + i] = map.blue[i];
     }
     return 0;
+}
+
+void FramebufferModel::ShowConsole(int console) const
+{
+    FileIdentity identity;
+    if (!Identify(state.framebufferFd, identity) || identity != state.framebuffer) return;
+    std::array<unsigned char, 4096> colour{};
+    colour.fill(static_cast<unsigned char>(0x55 + console));
+    bool const isPlanar = state.mode.depth == 4;
+    std::size_t const begin = isPlanar ? kVgaPlanesOffset : 0;
+    std::size_t const end = begin + std::size_t{state.mode.pitch} * state.mode.height * (isPlanar ? 4 : 1);
+    for (std::size_t at = begin; at < end; at += colour.size())
+        if (pwrite(state.framebufferFd, colour.data(), std::min(colour.size(), end - at),
+                static_cast<off_t>(at)) == -1)
+            return;
 }
 
 int FramebufferModel::GetColourMap(fb_cmap const& map) const

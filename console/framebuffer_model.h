@@ -17,6 +17,10 @@ public:
     /// Answers one of the framebuffer's ioctls; 0 or an error number. The caller holds the state.
     int Answer(Request request, void* argument);
 
+    /// Shows another console, of which nothing is known but that its screen is not the program's: a colour of
+    /// its own. The caller holds the state.
+    void ShowConsole(int console) const;
+
     /// The memory that a program is told of: twice what the mode shows, as the VESA driver takes it.
     static std::size_t MemoryLength(DisplayMode const& mode);
 

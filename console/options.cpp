@@ -25,8 +25,8 @@ at the device paths where programs look for them. No root, no device and no chan
                               OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
                               FBIOGET_VSCREENINFO, FBIOPUTCMAP, FBIOGETCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE,
                               KDSETMODE, KDGKBLED, KDSKBLED, VT_GETMODE, VT_SETMODE, VT_GETSTATE, VT_RELDISP,
-                              VT_ACTIVATE), or the path of one device, whose opening fails. ERRNO is a name
-                              (ENODEV) or a number
+                              VT_ACTIVATE, VT_WAITACTIVE), or the path of one device, whose opening fails.
+                              ERRNO is a name (ENODEV) or a number
   --report BITS:RED,GREEN,BLUE
                               let the driver tell of pixels of BITS bits with fields of these lengths,
                               whatever the mode is: to see how a program takes a mode that it doesn't support

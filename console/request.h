@@ -34,6 +34,7 @@ enum class Request : unsigned char {
     GetVtState,
     ReleaseDisplay,
     ActivateConsole,
+    AwaitConsole,
 };
 
 struct RequestInfo {
@@ -65,6 +66,7 @@ inline constexpr std::array kRequests = {
     RequestInfo{Request::GetVtState, "VT_GETSTATE", Device::Tty, VT_GETSTATE},
     RequestInfo{Request::ReleaseDisplay, "VT_RELDISP", Device::Tty, VT_RELDISP},
     RequestInfo{Request::ActivateConsole, "VT_ACTIVATE", Device::Tty, VT_ACTIVATE},
+    RequestInfo{Request::AwaitConsole, "VT_WAITACTIVE", Device::Tty, VT_WAITACTIVE},
 };
 
 struct DevicePath {

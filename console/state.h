@@ -34,7 +34,7 @@ struct TtyState {
     int consoleMode = KD_TEXT;
     unsigned leds = 0;    ///< bits 0-2 the lock states, 4-6 their defaults
     vt_mode vtMode{};     ///< begins as VT_AUTO
-    pid_t vtProcess = 0;  ///< who gets the signals of `vtMode`
+    pid_t vtProcess = 0;  ///< the thread that gets the signals of `vtMode`, if it lets them in
     int activeConsole = kOwnConsole;
     int pendingConsole = 0;  ///< the switch that waits for a release, 0 if none does
 };
@@ -68,6 +68,7 @@ struct State {
     std::uint32_t size = sizeof(State);
 
     // Fixed before the program starts. The descriptors have the same numbers in the tool and in the program.
+    int framebufferFd = -1;
     std::array<char, 32> framebufferPath{};  ///< under /proc/self/fd, so that each open is one of its own
     std::array<char, 64> ttyPath{};
     int mouseProgramFd = -1;

@@ -1,5 +1,7 @@
 #include <console/tty_model.h>
 
+#include <console/framebuffer_model.h>
+
 #include <bit>
 #include <cerrno>
 #include <csignal>
@@ -23,6 +25,7 @@ int TtyModel::Answer(Request request, void* argument)
     case Request::SetLeds: return SetLeds(number);
     case Request::ReleaseDisplay: return ReleaseDisplay(number);
     case Request::ActivateConsole: return Activate(number);
+    case Request::AwaitConsole: return Await(number);
     default: break;
     }
     if (argument == nullptr) return EFAULT;
@@ -67,7 +70,7 @@ int TtyModel::SetVtMode(vt_mode const& mode)
     if (mode.mode != VT_AUTO && mode.mode != VT_PROCESS) return EINVAL;
     tty.vtMode = mode;
     tty.vtMode.frsig = 0;
-    tty.vtProcess = getpid();
+    tty.vtProcess = gettid();
     tty.pendingConsole = 0;
     return 0;
 }
@@ -101,11 +104,19 @@ int TtyModel::ReleaseDisplay(unsigned long answer)
     return 0;
 }
 
+int TtyModel::Await(unsigned long console) const
+{
+    if (console < 1 || console > kConsoles) return ENXIO;
+    return static_cast<int>(console) == tty.activeConsole ? 0 : EAGAIN;
+}
+
+/// A console in text mode draws its screen when it is shown, which the program's is not taken for.
 void TtyModel::CompleteSwitch(int console)
 {
     tty.activeConsole = console;
-    if (console == TtyState::kOwnConsole && tty.vtMode.mode == VT_PROCESS &&
-        !SignalProcess(tty.vtMode.acqsig))
+    if (console != TtyState::kOwnConsole)
+        FramebufferModel(state).ShowConsole(console);
+    else if (tty.vtMode.mode == VT_PROCESS && !SignalProcess(tty.vtMode.acqsig))
         ResetOwnConsole();
 }
 

@@ -9,10 +9,10 @@ namespace console {
 /// the state.
 class TtyModel {
 public:
-    explicit TtyModel(State& shared) : tty(shared.ttyState) {}
+    explicit TtyModel(State& shared) : state(shared), tty(shared.ttyState) {}
 
     /// Answers one of the tty's ioctls; 0 or an error number. The argument is a number or an address, by the
-    /// request. The caller holds the state.
+    /// request. The caller holds the state, so VT_WAITACTIVE gives EAGAIN as long as it has to wait.
     int Answer(Request request, void* argument);
 
     /// Asks for a switch, as VT_ACTIVATE does and as the keys of another console do. 0, or ENXIO for a
@@ -25,10 +25,12 @@ private:
     int SetLeds(unsigned long leds);
     int SetVtMode(vt_mode const& mode);
     int ReleaseDisplay(unsigned long answer);
+    int Await(unsigned long console) const;
     void CompleteSwitch(int console);
     bool SignalProcess(int signal) const;
     void ResetOwnConsole();
 
+    State& state;
     TtyState& tty;
 };
 

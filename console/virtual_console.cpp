@@ -80,6 +80,7 @@ void VirtualConsole::MakeFramebuffer()
     Checked(ftruncate(fd, kLength), "making video memory");
     Checked(fcntl(fd, F_ADD_SEALS, F_SEAL_SHRINK | F_SEAL_GROW), "making video memory");
     pixels = OwnedMapping(fd, kLength, OwnedMapping::Access::Read, "making video memory");
+    state->framebufferFd = fd;
     std::snprintf(state->framebufferPath.data(), state->framebufferPath.size(), "/proc/self/fd/%d", fd);
     state->framebuffer = IdentityOf(fd);
 }

@@ -1,11 +1,15 @@
 #include <tessella/crash_l.h>
 
+#include <tessella/keyboard_l.h>
 #include <tessella/session.h>
 
 #include <bit>
+#include <csignal>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+
+#include <unistd.h>
 
 // The report names the registers of a 32-bit processor. On this one the words hold others (EIP is rdx, EBP
 // r12, ESP r13), and the stack lies above the end of memory there, so that a frame and a word are all that is
@@ -91,6 +95,44 @@ void PrintStack(Word esp)
     std::fputc('\n', stderr);
 }
 
+/// What the handler was told.
+struct {
+    siginfo_t const* info;
+    void const* context;
+} crash;
+
+[[noreturn]] void Report()
+{
+    auto const* const words = static_cast<Word const*>(crash.context);
+    std::fputs(kHomeAndClear, stderr);
+    std::fprintf(stderr, "Segmentation fault, addr=0x%08lX\n", std::bit_cast<Word>(crash.info->si_addr));
+    PrintRegisters(words);
+    PrintCode(words[kEip]);
+    PrintBacktrace(words[kEbp]);
+    PrintStack(words[kEsp]);
+    std::abort();
+}
+
+constexpr unsigned kLongestEnd = 2;  // seconds
+
+/// The fault has left a lock taken that the session's end needs, as faults in the heap do.
+void OnEndlessEnd(int /*signal*/)
+{
+    GiveConsoleBackAtOnce();
+    Report();
+}
+
+/// Gives the session's end a time, none if 0.
+void LimitEnd(unsigned seconds)
+{
+    sigset_t alarms{};
+    sigemptyset(&alarms);
+    sigaddset(&alarms, SIGALRM);
+    if (seconds != 0) std::signal(SIGALRM, OnEndlessEnd);
+    pthread_sigmask(SIG_UNBLOCK, &alarms, nullptr);
+    alarm(seconds);
+}
+
 }
 
 void InstallCrashHandler()
@@ -103,13 +145,9 @@ void InstallCrashHandler()
 
 void GrCrashHandler(int /*signal*/, siginfo_t* info, void* context)
 {
+    crash = {info, context};
+    LimitEnd(kLongestEnd);
     GrDone();
-    auto const* const words = static_cast<Word const*>(context);
-    std::fputs(kHomeAndClear, stderr);
-    std::fprintf(stderr, "Segmentation fault, addr=0x%08lX\n", std::bit_cast<Word>(info->si_addr));
-    PrintRegisters(words);
-    PrintCode(words[kEip]);
-    PrintBacktrace(words[kEbp]);
-    PrintStack(words[kEsp]);
-    std::abort();
+    LimitEnd(0);
+    Report();
 }

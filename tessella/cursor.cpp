@@ -6,6 +6,7 @@
 #include <tessella/screen_guard.h>
 
 #include <algorithm>
+#include <mutex>
 
 // The cursor is drawn into the framebuffer itself, so it keeps what lies under it. A move by less than its
 // size composes the new picture off the screen: what is saved of the overlap, and the fresh pixels of the two

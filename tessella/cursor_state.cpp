@@ -3,6 +3,8 @@
 #include <tessella/cursor.h>
 #include <tessella/screen_guard.h>
 
+#include <mutex>
+
 constinit std::atomic<GrCursor*> currentCursor{nullptr};
 constinit std::atomic<bool> cursorVisible{false};
 

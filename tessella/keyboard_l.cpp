@@ -53,6 +53,8 @@ private:
 KeyRing keyRing;  // guarded by keyRingMutex
 
 std::atomic<int> consoleTty{-1};
+std::atomic<int> consoleNumber{0};
+std::atomic<int> returnNotice{-1};  // the end of a pipe that is written when the console comes back
 static_assert(std::atomic<int>::is_always_lock_free, "signal handlers read it");
 
 /// False if the byte is lost. On the keyboard's thread.
@@ -62,7 +64,7 @@ bool GrKeyRingPush(unsigned char byte)
         std::scoped_lock const lock(keyRingMutex);
         if (keyRing.Push(byte)) return true;
     }
-    GrBeep();
+    BeepAtOnce();
     return false;
 }
 
@@ -124,12 +126,14 @@ public:
     bool Open() override;
     bool Close() override;
     void OnKeyChange(unsigned vk, bool pressed) override;
+    void GiveConsoleBack();
 
 private:
     /// A request to the tty with a number; true if it is carried out.
     bool Request(unsigned long request, long number) const { return ioctl(tty, request, number) == 0; }
     void TakeConsole();
-    void GiveConsoleBack();
+    void ReadKey() const;
+    void TakeReturnNotice() const;
     static void* ReadKeys(void* keyboard);
 
     // As they were found. What could not be learned is not sent back.
@@ -140,6 +144,7 @@ private:
     int tty = -1;
     vt_mode vtMode{};
     bool hasConsole = false;
+    std::array<int, 2> returnPipe{-1, -1};  ///< the end that the thread reads, the end that is written
     InputThread thread;
 };
 
@@ -169,25 +174,31 @@ void GrLinuxKeyboard::TakeConsole()
     ioctl(tty, VT_GETMODE, &vtMode);
     vtMode.mode = VT_PROCESS;
     vtMode.relsig = vtMode.acqsig = SIGUSR2;
+    if (vt_stat consoles{}; ioctl(tty, VT_GETSTATE, &consoles) == 0) consoleNumber = consoles.v_active;
     consoleTty = tty;
+    if (pipe2(returnPipe.data(), O_NONBLOCK | O_CLOEXEC) == 0) returnNotice = returnPipe[1];
     signal(SIGUSR2, GrConsoleSignal);
     ioctl(tty, VT_SETMODE, &vtMode);
 }
 
 void GrLinuxKeyboard::GiveConsoleBack()
 {
+    if (!hasConsole) return;
     if (savedKeyboardMode) Request(KDSKBMODE, *savedKeyboardMode);
     if (savedConsoleMode) Request(KDSETMODE, *savedConsoleMode);
     vtMode.mode = VT_AUTO;
     ioctl(tty, VT_SETMODE, &vtMode);
     consoleTty = -1;
+    if (returnNotice.exchange(-1) != -1)
+        for (int const end : returnPipe)
+            close(end);
     if (savedTerminal) tcsetattr(tty, TCSANOW, &*savedTerminal);
 }
 
 bool GrLinuxKeyboard::Close()
 {
     if (thread.WasStarted()) thread.Stop();
-    if (hasConsole) GiveConsoleBack();
+    GiveConsoleBack();
     if (tty != -1) close(tty);
     return GrSmartKeyboard::Close();
 }
@@ -196,11 +207,25 @@ bool GrLinuxKeyboard::Close()
 void* GrLinuxKeyboard::ReadKeys(void* keyboard)
 {
     auto const& self = *static_cast<GrLinuxKeyboard const*>(keyboard);
-    while (self.thread.WaitForInput(self.tty, InputThread::PollFailure::Ends)) {
-        unsigned char byte = 0;
-        if (read(self.tty, &byte, 1) == 1 && GrKeyRingPush(byte)) GrPostInputWake();
-    }
-    return nullptr;
+    int const devices[] = {self.tty, self.returnPipe[0]};
+    for (;;)
+        switch (self.thread.WaitForInput(devices, InputThread::PollFailure::Ends)) {
+        case 0: self.ReadKey(); break;
+        case 1: self.TakeReturnNotice(); break;
+        default: return nullptr;
+        }
+}
+
+void GrLinuxKeyboard::ReadKey() const
+{
+    unsigned char byte = 0;
+    if (read(tty, &byte, 1) == 1 && GrKeyRingPush(byte)) GrPostInputWake();
+}
+
+void GrLinuxKeyboard::TakeReturnNotice() const
+{
+    unsigned char notice = 0;
+    if (read(returnPipe[0], &notice, 1) == 1) GrUnfreeze();
 }
 
 /// Control with alt or shift, and F1 to F10: these ask for another console, at the release as well.
@@ -228,3 +253,17 @@ void GrKeyboardDestroy()
 }
 
 int ConsoleTty() { return consoleTty; }
+
+int ConsoleNumber() { return consoleNumber; }
+
+void GiveConsoleBackAtOnce()
+{
+    // The session has made no other kind.
+    if (ConsoleTty() != -1) static_cast<GrLinuxKeyboard*>(sessionKeyboard)->GiveConsoleBack();
+}
+
+void WakeAfterReturn()
+{
+    // A pipe that is full has enough to wake the pump.
+    [[maybe_unused]] ssize_t const written = write(returnNotice, "", 1);
+}

@@ -96,20 +96,26 @@ void OnMouseEnabledChanged()
 /// of crashes does, and the application while somebody else has the console.
 constinit std::atomic<bool> mouseStopping{false};
 
+constexpr std::chrono::nanoseconds kGlance{10'000'000};  // from one look at the session to the next
+
+bool LockAtAGlance(ScreenMutex& mutex) { return mutex.try_lock_for(kGlance); }
+
+bool LockAtAGlance(std::mutex& mutex)
+{
+    timespec deadline{};
+    clock_gettime(CLOCK_MONOTONIC, &deadline);
+    deadline.tv_nsec += kGlance.count();
+    deadline.tv_sec += deadline.tv_nsec / 1'000'000'000;
+    deadline.tv_nsec %= 1'000'000'000;
+    return pthread_mutex_clocklock(mutex.native_handle(), CLOCK_MONOTONIC, &deadline) == 0;
+}
+
 /// The lock for a report of the mouse; not held if the session ends meanwhile.
 template <typename Mutex>
 std::unique_lock<Mutex> LockUnlessStopping(Mutex& mutex)
 {
-    constexpr long kGlance = 10'000'000;  // nanoseconds from one look at the session to the next
-    while (!mouseStopping) {
-        timespec deadline{};
-        clock_gettime(CLOCK_REALTIME, &deadline);
-        deadline.tv_nsec += kGlance;
-        deadline.tv_sec += deadline.tv_nsec / 1'000'000'000;
-        deadline.tv_nsec %= 1'000'000'000;
-        if (pthread_mutex_timedlock(mutex.native_handle(), &deadline) == 0)
-            return std::unique_lock(mutex, std::adopt_lock);
-    }
+    while (!mouseStopping)
+        if (LockAtAGlance(mutex)) return std::unique_lock(mutex, std::adopt_lock);
     return std::unique_lock(mutex, std::defer_lock);
 }
 

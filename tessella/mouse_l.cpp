@@ -41,7 +41,7 @@ std::span<unsigned char const> ReadPacket(std::array<unsigned char, 4>& buffer)
 void* ReadMouse(void*)
 {
     std::array<unsigned char, 4> buffer{};
-    while (mouseThread.WaitForInput(mouseFd, InputThread::PollFailure::Ignored)) {
+    while (mouseThread.WaitForInput({&mouseFd, 1}, InputThread::PollFailure::Ignored) != -1) {
         MousePacket const packet = DecodeMousePacket(ReadPacket(buffer));
         GrMouseReport(packet.buttons, packet.dx, packet.dy, packet.wheel);
     }

@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <span>
 
-constinit std::recursive_mutex screenMutex;
+constinit ScreenMutex screenMutex;
 constinit std::atomic<std::uint32_t> hideCount{1};
 
 namespace {

@@ -1,14 +1,15 @@
 #pragma once
 
 #include <tessella/region.h>
+#include <tessella/screen_mutex_l.h>
 
 #include <atomic>
 #include <cstdint>
-#include <mutex>
 
 /// Serialises access to the framebuffer. Held from the start of the outermost guard to its end. Before it
-/// comes, in the order of locking, the mouse's mutex.
-extern std::recursive_mutex screenMutex;
+/// comes, in the order of locking, the mouse's mutex. The handler of console switches keeps it for the
+/// application's thread while somebody else has the console.
+extern ScreenMutex screenMutex;
 
 /// Above 0, nobody may draw or move the cursor on the screen. It rests at 1 while the pointer is not in use;
 /// guards then take no lock at all, as there is no cursor to protect. Not per thread.

@@ -1,5 +1,6 @@
 #include <tessella/session.h>
 
+#include <tessella/console_l.h>
 #include <tessella/crash_l.h>
 #include <tessella/event_wait_l.h>
 #include <tessella/font_factory.h>
@@ -22,6 +23,7 @@ bool GrInit(unsigned& width, unsigned& height, unsigned& depth, unsigned mode)
     sessionThread = pthread_self();
     if (!OpenFramebuffer()) return false;
     RequestVgaPorts();
+    ConsoleSignalBlock const block;
     GrKeyboardCreate();
     if (!GrSetVideoMode(width, height, depth, mode)) return false;
     LoadFontTable();

@@ -35,16 +35,21 @@ void InputThread::Stop()
         close(end);
 }
 
-bool InputThread::WaitForInput(int device, PollFailure failure) const
+int InputThread::WaitForInput(std::span<int const> devices, PollFailure failure) const
 {
-    pollfd waiting[] = {{stopPipe[0], POLLIN, 0}, {device, POLLIN, 0}};
+    pollfd waiting[3] = {{stopPipe[0], POLLIN, 0}};
+    std::size_t count = 1;
+    for (int const device : devices)
+        waiting[count++] = {device, POLLIN, 0};
     for (;;) {
-        bool const failed = poll(waiting, 2, -1) < 0;
-        if (failed && failure == PollFailure::Ends && IsLasting(errno)) return false;
-        if (waiting[0].revents & POLLIN) return false;
-        if (waiting[1].revents & POLLIN) return true;
-        // A device that is gone would have poll return at once for ever; a negative descriptor is passed
-        // over.
-        if (waiting[1].revents & (POLLERR | POLLHUP | POLLNVAL)) waiting[1].fd = -1;
+        bool const failed = poll(waiting, count, -1) < 0;
+        if (failed && failure == PollFailure::Ends && IsLasting(errno)) return -1;
+        if (waiting[0].revents & POLLIN) return -1;
+        for (std::size_t i = 1; i < count; ++i) {
+            if (waiting[i].revents & POLLIN) return static_cast<int>(i) - 1;
+            // A device that is gone would have poll return at once for ever; a negative descriptor is passed
+            // over.
+            if (waiting[i].revents & (POLLERR | POLLHUP | POLLNVAL)) waiting[i].fd = -1;
+        }
     }
 }

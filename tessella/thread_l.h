@@ -1,6 +1,7 @@
 #pragma once
 
 #include <array>
+#include <span>
 
 #include <pthread.h>
 
@@ -21,8 +22,9 @@ public:
     /// What a `poll` means that fails for a reason that stays: a descriptor or an address that is none.
     enum class PollFailure : unsigned char { Ignored, Ends };
 
-    /// Waits until the device can be read; false if the thread is to end. On the thread itself.
-    bool WaitForInput(int device, PollFailure failure) const;
+    /// Waits until one of the devices, two at most, can be read, and gives its index; -1 if the thread is to
+    /// end. On the thread itself.
+    int WaitForInput(std::span<int const> devices, PollFailure failure) const;
 
 private:
     pthread_t thread{};

@@ -21,10 +21,12 @@ void GrWindow::DoGetClipRegion(GrRegion& out, GrWindow const* stop, bool fromVal
         return;
     }
     if (this == &Screen) {
-        if (fromValid)
+        if (fromValid) {
+            InvalidateLostScreen();
             out = ValidRegion;
-        else
+        } else {
             out = bounds;
+        }
     } else {
         if (!GR_ASSERT_TEXT(parent, "parent != 0")) {
             out.Clear();

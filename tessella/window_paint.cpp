@@ -4,9 +4,13 @@
 #include <tessella/coordinates.h>
 #include <tessella/session_state.h>
 
+#include <new>
+
 // Nobody keeps a list of what is to be painted. One region tells what of the screen is valid, and a paint
 // event is computed when it is asked for: the first invalid point has an owner, who gets all that is invalid
 // of him in one go. So a pass has about as many events as windows that are touched.
+
+constinit std::atomic<bool> screenLost{false};
 
 namespace {
 
@@ -67,8 +71,20 @@ void WalkPaint(GrRegion& area, GrEvent& event, bool markValid)
     event.type = GrEventPaint;
 }
 
+void InvalidateLostScreen()
+{
+    if (!screenLost.load(std::memory_order_relaxed) || !screenLost.exchange(false)) return;
+    try {
+        Screen.FullInvalidate(true);
+    } catch (std::bad_alloc const&) {
+        screenLost = true;
+        throw;
+    }
+}
+
 bool GrWindow::IsInvalidated() const
 {
+    InvalidateLostScreen();
     for (GrWindow const* window = this; window; window = window->parent)
         if (window->flags & GrWindowInvalidated) return true;
     return (Screen.flags & GrWindowInvalidated) != 0;
@@ -102,6 +118,7 @@ void GrWindow::FullInvalidate(bool force)
 
 void GrWindow::ResetInvalidated()
 {
+    InvalidateLostScreen();
     for (GrWindow* child = first; child; child = child->next)
         if (child->flags & GrWindowInvalidated) child->ResetInvalidated();
     flags &= ~GrWindowInvalidated;
@@ -117,6 +134,7 @@ bool GrWindow::GetPaintEvent(GrEvent* event)
 
 bool GrWindow::GetPaintEvent(GrEvent* event, GrRegion& area)
 {
+    InvalidateLostScreen();
     area -= ValidRegion;
     if (!area) return false;
     if (event) WalkPaint(area, *event, true);

@@ -87,8 +87,9 @@ GR_API unsigned GrFindVkForChar(unsigned ch);
 GR_API char16_t const* GrGetKeyboardLayout();
 
 /// Asks the kernel for another console, as control with alt or shift, and F1 to F10, do; the first one is 1.
-/// True if the kernel has taken the request, false without a keyboard or for a console that does not exist. A
-/// session does not let its console go yet: the request is then answered with no.
+/// True if the kernel has taken the request, false without a keyboard or for a console that does not exist.
+/// The session lets its console go as soon as no other thread draws, and at once while no pointer is in use;
+/// see `GrInit`.
 GR_API bool SwitchToConsole(int number);
 
 /// Tells when the user starts and stops moving the pointer by keys, say to show it in another colour:
@@ -98,7 +99,8 @@ GR_API bool SwitchToConsole(int number);
 ///
 /// F10 starts and stops it, and so do control-M, and num lock with the left shift and left alt; applications
 /// do not see these keys being pressed. Meanwhile they see no keys at all. The arrows and the numeric pad
-/// move the pointer, the faster the longer they are held. Blank, return, and enter and the centre of the pad
-/// are the left button, menu is the right one. A mouse goes on working; without one the pointer is in use
-/// only meanwhile.
+/// move the pointer, the faster the longer they are held. Blank, return, the pad's enter, and its centre
+/// without num lock are the left button, menu is the right one. Of a key that is held while this starts or
+/// stops, the application sees the press alone or the release alone, and a button stays down. A mouse goes on
+/// working; without one the pointer is in use only meanwhile.
 GR_API void GrSetMouseEmulationNotify(void (*callback)(void* user, bool active), void* user);

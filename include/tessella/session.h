@@ -12,10 +12,17 @@
 ///
 /// The console is taken: its keyboard gives key codes, read on a thread of the library's own, the terminal
 /// passes bytes on as they are, and the kernel keeps its text off the screen. SIGUSR2 gets the handler for
-/// requests to switch the console, and keeps it. A program that ends without `GrDone` leaves the console like
-/// this. The layouts of the keys are those of the language that the environment names (LC_ALL, LC_MESSAGES,
-/// LANG) when the session begins. The session goes on without keys if no tty opens, which is told on the
-/// standard error stream, or if the layouts cannot be read, which is not.
+/// console switches, and keeps it. A program that ends without `GrDone` leaves the console like this. The
+/// layouts of the keys are those of the language that the environment names (LC_ALL, LC_MESSAGES, LANG) when
+/// the session begins. The session goes on without keys if no tty opens, which is told on the standard error
+/// stream, or if the layouts cannot be read, which is not.
+///
+/// When the user changes to another console, what is being drawn on other threads while the pointer is in use
+/// is waited for. Until the return nothing is due for paint and no keys come; once the mouse has moved, calls
+/// that look for input or the pointer wait, too. What the application's thread draws all the same shows on
+/// the other console. Then all of the screen is due, a `GrGetEvent` that waits returns false, and of the
+/// modifiers only the locks are left. The signal has to find the application's thread: others must block
+/// SIGUSR2.
 ///
 /// The mouse device is opened, if there is one, and read on a thread of the library's own, which takes no
 /// signals. The pointer begins in the middle of the screen. All of the screen is due for paint.

@@ -1,5 +1,6 @@
 #include <support/on_console.h>
 #include <tessella.h>
+#include <tessella/keyboard_l.h>
 #include <tessella/mouse.h>
 #include <tessella/screen_guard.h>
 #include <tessella/session_state.h>
@@ -7,11 +8,15 @@
 #include <gtest/gtest.h>
 
 #include <array>
+#include <atomic>
 #include <chrono>
 #include <csignal>
+#include <cstdlib>
+#include <new>
 #include <thread>
 
 #include <sys/mman.h>
+#include <unistd.h>
 
 // Segmentation faults on the virtual console.
 
@@ -19,6 +24,33 @@
 extern "C" __attribute__((visibility("default"))) char const* __tsan_default_suppressions()
 {
     return "signal:GrCrashHandler\n";
+}
+
+/// As after a fault in the allocator, which is in the midst of something then.
+static std::atomic<bool> heapIsLocked{false};
+
+static void WaitForHeap()
+{
+    while (heapIsLocked)
+        pause();
+}
+
+[[gnu::noinline]] void* operator new(std::size_t size)
+{
+    WaitForHeap();
+    return std::malloc(size);
+}
+
+[[gnu::noinline]] void operator delete(void* memory) noexcept
+{
+    WaitForHeap();
+    std::free(memory);
+}
+
+[[gnu::noinline]] void operator delete(void* memory, std::size_t /*size*/) noexcept
+{
+    WaitForHeap();
+    std::free(memory);
 }
 
 namespace {
@@ -43,16 +75,20 @@ unsigned long& WordAt(unsigned long address) { return *reinterpret_cast<unsigned
 std::array<unsigned long, 11> registers = {
     0x11, 0x22, kFrames, kStack, 0x123456789, 0x66, 0x77, 0x88, kCode, 0x7777BBAA, 0xCC};
 
-constexpr int kReported = 7 << 8;
+constexpr int kReported = 7 << 8, kGivenBack = 9 << 8;
 
-/// What a program tells that faults in `body`, in ten seconds; `kReported` if it aborts without a session.
+/// What a program tells that faults in `body`, in ten seconds; `kReported` if it aborts without a session,
+/// and `kGivenBack` if it does so in one that has no console any more.
 template <typename Body>
 ChildOutcome Crash(Body body, bool inSession = true)
 {
     return RunChild([&] {
         console::VirtualConsole screen({*console::ParseMode("64x48x16"), {}, {}});
         screen.AttachProcess();
-        std::signal(SIGABRT, [](int) { _exit(initialized ? 9 : 7); });
+        static auto& tty = screen;
+        std::signal(SIGABRT, [](int) {
+            _exit(!initialized ? 7 : tty.Tty().consoleMode == KD_TEXT && ConsoleTty() == -1 ? 9 : 10);
+        });
         alarm(10);
         mmap(reinterpret_cast<void*>(kCode), 4096, PROT_READ | PROT_WRITE,
             MAP_PRIVATE | MAP_ANONYMOUS | MAP_FIXED_NOREPLACE, -1, 0);
@@ -134,6 +170,13 @@ TEST(Crash, WhileTheMouseMoves)
         });
         EXPECT_EQ(outcome.status, kReported) << place << outcome.err;
     }
+}
+
+TEST(Crash, InTheHeapGivesTheConsoleBack)
+{
+    auto const outcome = Crash([](auto&) { heapIsLocked = true; });
+    EXPECT_EQ(outcome.status, kGivenBack);
+    EXPECT_NE(outcome.err.find("Stack:"), std::string::npos) << outcome.err;
 }
 
 }

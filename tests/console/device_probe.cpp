@@ -67,6 +67,7 @@ int main(int, char** words)
     REQUEST(VT_SETMODE, &vt);
     REQUEST(VT_GETSTATE, &state);
     REQUEST(VT_ACTIVATE, 1);
+    REQUEST(VT_WAITACTIVE, 1);
     REQUEST(VT_RELDISP, VT_ACKACQ);
 
     OPEN("/dev/mice", O_RDWR);

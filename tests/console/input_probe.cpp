@@ -67,6 +67,7 @@ int main()
         if ((ready[2].revents & POLLIN) != 0 && read(signals, &signal, sizeof signal) > 0) {
             away = !away;
             std::puts(away ? "released" : "acquired");
+            if (!away) std::memset(memory, 0, fixed.smem_len);
             ioctl(tty, VT_RELDISP, away ? 1 : VT_ACKACQ);
         }
         for (std::size_t y = 0; y < rows.size() && !away; ++y)

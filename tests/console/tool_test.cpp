@@ -70,7 +70,7 @@ TEST(ConsoleTool, ProgramFindsAllDevicesAndTheirFaults)
         "/dev/fb0 ok\nIOPERM ok\nFBIOGET_FSCREENINFO ok\nFBIOGET_VSCREENINFO ok\n"
         "mode 1024x768x32(8,8,8) pitch 4096\nMMAP ok\nFBIOPUTCMAP ok\n"
         "/dev/tty0 ok\nKDGKBLED ok\nKDSKBLED ok\nKDGKBMODE ok\nKDSKBMODE ok\nKDGETMODE ok\nKDSETMODE ok\n"
-        "VT_GETMODE ok\nVT_SETMODE ok\nVT_GETSTATE ok\nVT_ACTIVATE ok\nVT_RELDISP ok\n"
+        "VT_GETMODE ok\nVT_SETMODE ok\nVT_GETSTATE ok\nVT_ACTIVATE ok\nVT_WAITACTIVE ok\nVT_RELDISP ok\n"
         "/dev/mice ok\nmouse fa 03\n";
     EXPECT_EQ(OnConsole("-- " CHECKED_DEVICE_PROBE " 0").out, found);
     // All requests fail at once, each with an error of its own.

@@ -38,6 +38,8 @@ FURTHER_KEYS |= dict(enumerate((0xC7, 0xC8, 0xC9, 0xCB, 0xCD, 0xCF, 0xD0, 0xD1, 
 FURTHER_KEYS |= {119: 0xC6, 125: 0xDB, 126: 0xDC, 127: 0xDD}
 
 BOOT_SECONDS = 60
+# A command for the guest, which has no mouse before.
+PLUG_MOUSE = "insmod /mouse.ko; until grep -q Mouse /proc/bus/input/devices; do usleep 50000; done"
 ANSWER_SECONDS = 20
 
 

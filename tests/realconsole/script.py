@@ -17,7 +17,6 @@ KEY_SECONDS = 0.01
 SWITCH_SECONDS = 0.05
 OPENED_SECONDS = 0.5
 
-PLUG_MOUSE = "insmod /mouse.ko; until grep -q Mouse /proc/bus/input/devices; do usleep 50000; done"
 # In the background: the machine stays free for further commands.
 START = (
     "rm -f /tmp/status; (sh -c 'echo $$ > /tmp/pid; exec env LC_ALL={language} {program} > /tmp/output 2>&1';"
@@ -59,7 +58,7 @@ class Player:
     def play(self, steps: list[str], program: object, language: str) -> list[str]:
         """Starts the program and returns what it wrote, on both streams, when it has ended. It has the
         console meanwhile; if it ends by itself, the console is as it was, else nobody has given it back."""
-        self._real.run(PLUG_MOUSE)
+        self._real.run(machine.PLUG_MOUSE)
         before = self._console_state()
         self._real.run(START.format(program=program, language=language))
         for step in steps:
@@ -69,7 +68,7 @@ class Player:
                 self._check_console(TAKEN)
         self._await(HAS_ENDED)
         status = int(self._real.run("cat /tmp/status")[1][0])
-        output = self._real.run("cat /tmp/output")[1]
+        output = self._real.run("awk 1 /tmp/output")[1]  # which ends the last line, too
         if status != (TERMINATED if steps[-1] == "quit" else 0):
             raise ScriptError(f"{program} ended with status {status}: {output}")
         self._check_console(LEFT if steps[-1] == "quit" else re.compile(re.escape(before)))

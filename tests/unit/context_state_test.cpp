@@ -140,11 +140,13 @@ TEST(LoadTime, StateStandsBeforeAnySession)
     EXPECT_EQ(mouseButtons, 7u);
     EXPECT_EQ(emulatedButtons, 7u);
     EXPECT_EQ(hideCount, 1u);
-    for (auto* const mutex : {&screenMutex, &grabMutex}) {
-        std::scoped_lock const once(*mutex);
-        EXPECT_TRUE(mutex->try_lock()) << "recursive";
-        mutex->unlock();
-    }
+    auto const lockTwice = [](auto& mutex) {
+        std::scoped_lock const once(mutex);
+        EXPECT_TRUE(mutex.try_lock()) << "recursive";
+        mutex.unlock();
+    };
+    lockTwice(screenMutex);
+    lockTwice(grabMutex);
 }
 
 bool FreeForOthers()

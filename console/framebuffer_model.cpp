@@ -97,6 +97,7 @@ void FramebufferModel::ShowConsole(int console) const
     std::array<unsigned char, 4096> colour{};
     colour.fill(static_cast<unsigned char>(0x55 + console));
     bool const isPlanar = state.mode.depth == 4;
+    if (isPlanar) state.vga.latches = 0;  // its black has gone through them
     std::size_t const begin = isPlanar ? kVgaPlanesOffset : 0;
     std::size_t const end = begin + std::size_t{state.mode.pitch} * state.mode.height * (isPlanar ? 4 : 1);
     for (std::size_t at = begin; at < end; at += colour.size())

@@ -14,6 +14,13 @@ constexpr std::uint8_t ShownByConverter(std::uint16_t component)
     return static_cast<std::uint8_t>(component >> 8);
 }
 
+/// The same in the 4-plane mode, whose converter is 6 bits wide and repeats the lowest of them.
+constexpr std::uint8_t ShownByNarrowConverter(std::uint16_t component)
+{
+    unsigned const value = component >> 10;
+    return static_cast<std::uint8_t>(value << 2 | (value & 1) * 3);
+}
+
 /// A field of a pixel in a mode without a colour map. A 16-bit mode repeats a field's upper bits below it, so
 /// that white is full white; a 15-bit mode leaves zeros there, and its white is 0xF8F8F8.
 constexpr std::uint8_t ShownField(unsigned value, unsigned length, unsigned depth)

@@ -3,11 +3,14 @@
 #include <console/framebuffer_model.h>
 #include <console/mouse_model.h>
 #include <console/tty_model.h>
+#include <console/vga_trap.h>
 
+#include <bit>
 #include <cerrno>
 #include <ctime>
 
 #include <fcntl.h>
+#include <sys/mman.h>
 #include <sys/syscall.h>
 #include <unistd.h>
 
@@ -62,6 +65,33 @@ int OpenMouse(State& state, int flags)
     return fd;
 }
 
+/// The planes for this process, mapped once for each console that it is attached to.
+void* MapPlanes(State const& state)
+{
+    static void* planes = MAP_FAILED;
+    static FileIdentity owner;
+    if (planes != MAP_FAILED && owner == state.framebuffer) return planes;
+    int const fd = OpenFile(state.framebufferPath.data(), O_RDWR | O_CLOEXEC);
+    // By the kernel's own entry, as this is called from within the function of that name.
+    long const mapped = syscall(
+        SYS_mmap, nullptr, kVgaPlanesLength, PROT_READ | PROT_WRITE, MAP_SHARED, fd, kVgaPlanesOffset);
+    syscall(SYS_close, fd);
+    planes = std::bit_cast<void*>(mapped);
+    owner = state.framebuffer;
+    return planes;
+}
+
+/// From now on the graphics controller answers for its ports, and for the window unless that is null.
+void PlugVga(State& state, unsigned char* window)
+{
+    static constinit VgaModel model;
+    TrapVga(nullptr, nullptr);
+    void* const planes = MapPlanes(state);
+    if (planes == MAP_FAILED) return;
+    model = VgaModel(state.vga, static_cast<std::uint32_t*>(planes));
+    TrapVga(window, &model);
+}
+
 int OpenNode(State& state, Device device, int flags)
 {
     // A device's length cannot be cut and a console opened as tty0 never becomes the controlling terminal.
@@ -96,7 +126,11 @@ int AwaitConsole(State& state, void* console)
 
 }
 
-void Attach(State* state) { attached.store(state, std::memory_order_release); }
+void Attach(State* state)
+{
+    TrapVga(nullptr, nullptr);
+    attached.store(state, std::memory_order_release);
+}
 
 std::optional<int> OpenDevice(char const* path, int flags)
 {
@@ -148,13 +182,26 @@ std::optional<int> MapDevice(int fd)
     return Result(fault);
 }
 
+void OnMapped(int fd, void* memory, std::size_t length)
+{
+    State* const state = Attached();
+    if (state == nullptr || fd < 0 || !Is(fd, state->framebuffer)) return;
+    TrapVga(nullptr, nullptr);
+    StateLock const lock(*state);
+    if (state->mode.depth != 4 || length != VgaModel::kWindow) return;
+    if (mprotect(memory, length, PROT_NONE) == 0) PlugVga(*state, static_cast<unsigned char*>(memory));
+}
+
 std::optional<int> AllowPorts(unsigned long from, unsigned long count)
 {
     State* const state = Attached();
     if (state == nullptr || from < kFirstVgaPort || from > kLastVgaPort || count > kLastVgaPort + 1 - from)
         return std::nullopt;
     StateLock const lock(*state);
-    return Result(Enter(*state, SlotOf(Request::PortAccess)));
+    int const fault = Enter(*state, SlotOf(Request::PortAccess));
+    state->vga.portsAllowed = fault == 0;
+    if (fault == 0 && state->mode.depth == 4 && !IsVgaTrapped()) PlugVga(*state, nullptr);
+    return Result(fault);
 }
 
 }

@@ -21,6 +21,8 @@ std::optional<int> ControlDevice(int fd, unsigned long number, void* argument);
 std::optional<ssize_t> WriteDevice(int fd, void const* data, std::size_t length);
 /// Only ever a failure: memory is mapped by the kernel.
 std::optional<int> MapDevice(int fd);
+/// What it has mapped. In the 4-plane mode the controller stands before it from now on.
+void OnMapped(int fd, void* memory, std::size_t length);
 /// Ports of the VGA adapter alone.
 std::optional<int> AllowPorts(unsigned long from, unsigned long count);
 

@@ -1,5 +1,7 @@
 #include <console/display_mode.h>
 
+#include <console/vga_model.h>
+
 #include <array>
 #include <charconv>
 
@@ -39,11 +41,18 @@ std::optional<unsigned> ParseNumber(std::string_view text)
     return number;
 }
 
+unsigned ShortestPitch(unsigned width, unsigned depth)
+{
+    return depth == 4 ? width / 8 : width * BytesPerPixel(depth);
+}
+
 unsigned BytesPerPixel(unsigned depth) { return (depth + 7) / 8; }
 
 PixelFormat FormatOf(unsigned depth)
 {
     switch (depth) {
+    // The planar driver tells how wide the converter is.
+    case 4: return {4, {0, 6}, {0, 6}, {0, 6}, {0, 0}};
     // In a mode with a colour map the kernel's driver gives each field the whole pixel.
     case 8: return {8, {0, 8}, {0, 8}, {0, 8}, {0, 8}};
     case 15: return {16, {10, 5}, {5, 5}, {0, 5}, {15, 1}};
@@ -59,8 +68,10 @@ std::optional<DisplayMode> ParseMode(std::string_view text)
     if (!numbers) return std::nullopt;
     auto const [width, height, depth] = *numbers;
     if (width < 1 || width > kLongestSide || height < 1 || height > kLongestSide) return std::nullopt;
-    if (depth != 8 && depth != 15 && depth != 16 && depth != 24 && depth != 32) return std::nullopt;
-    return DisplayMode{width, height, depth, width * BytesPerPixel(depth)};
+    if (depth == 4 && (width % 8 != 0 || width / 8 * height > VgaModel::kWindow)) return std::nullopt;
+    if (depth != 4 && depth != 8 && depth != 15 && depth != 16 && depth != 24 && depth != 32)
+        return std::nullopt;
+    return DisplayMode{width, height, depth, ShortestPitch(width, depth)};
 }
 
 std::optional<PixelFormat> ParseFormat(std::string_view text)
@@ -74,7 +85,8 @@ std::optional<PixelFormat> ParseFormat(std::string_view text)
 
 bool IsPitchValid(DisplayMode const& mode, unsigned pitch)
 {
-    return pitch >= mode.width * BytesPerPixel(mode.depth) && pitch <= kLongestPitch;
+    unsigned const shortest = ShortestPitch(mode.width, mode.depth);
+    return mode.depth == 4 ? pitch == shortest : pitch >= shortest && pitch <= kLongestPitch;
 }
 
 }

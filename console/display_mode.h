@@ -8,8 +8,9 @@ namespace console {
 inline constexpr unsigned kLongestSide = 8192;    // pixels
 inline constexpr unsigned kLongestPitch = 65536;  // bytes
 
-/// A video mode of the virtual adapter. The depth names the pixels as one speaks of them: 8 (through the
-/// colour map), 15 (5-5-5), 16 (5-6-5), 24 (three bytes) and 32 (24 bits of colour in four bytes).
+/// A video mode of the virtual adapter. The depth names the pixels as one speaks of them: 4 (through a colour
+/// map, a bit in each of four planes), 8 (through the colour map), 15 (5-5-5), 16 (5-6-5), 24 (three bytes)
+/// and 32 (24 bits of colour in four bytes).
 struct DisplayMode {
     unsigned width = 1024;
     unsigned height = 768;
@@ -28,11 +29,11 @@ struct PixelFormat {
     ColourField red, green, blue, transparency;
 };
 
-unsigned BytesPerPixel(unsigned depth);
+unsigned BytesPerPixel(unsigned depth);  ///< of packed pixels
 PixelFormat FormatOf(unsigned depth);
 
 /// Reads "WIDTHxHEIGHTxDEPTH" and sets the shortest pitch. Nothing if it is malformed, if a side isn't from 1
-/// to 8192, or if the adapter doesn't know the depth.
+/// to 8192, or if the adapter doesn't know the depth. Planes have whole bytes a row and a short window.
 std::optional<DisplayMode> ParseMode(std::string_view text);
 
 /// Reads "BITS:RED,GREEN,BLUE", the last three being lengths of fields. Nothing if malformed.

@@ -11,6 +11,7 @@ namespace console {
 
 namespace {
 
+constexpr unsigned long kVgaWindow = 0xA0000;
 constexpr unsigned long kPhysicalAddress = 0xFD000000;  // nothing maps it; where adapters tend to lie
 
 fb_bitfield BitField(ColourField field) { return {field.offset, field.length, 0}; }
@@ -27,17 +28,35 @@ int CheckMap(fb_cmap const& map)
 
 std::size_t FramebufferModel::MemoryLength(DisplayMode const& mode)
 {
-    return std::size_t{2} * mode.pitch * mode.height;
+    return mode.depth == 4 ? VgaModel::kWindow : std::size_t{2} * mode.pitch * mode.height;
 }
 
 fb_fix_screeninfo FramebufferModel::FixedInfo() const
 {
     fb_fix_screeninfo info{};
+    if (state.mode.depth == 4) return PlanarFixedInfo();
     std::strcpy(info.id, "VESA VGA");
     info.smem_start = kPhysicalAddress;
     info.smem_len = static_cast<unsigned>(MemoryLength(state.mode));
     info.type = FB_TYPE_PACKED_PIXELS;
     info.visual = state.format.bits <= 8 ? FB_VISUAL_PSEUDOCOLOR : FB_VISUAL_TRUECOLOR;
+    info.line_length = state.mode.pitch;
+    info.accel = FB_ACCEL_NONE;
+    return info;
+}
+
+/// As the kernel's driver for the 16-colour modes tells it.
+fb_fix_screeninfo FramebufferModel::PlanarFixedInfo() const
+{
+    fb_fix_screeninfo info{};
+    std::strcpy(info.id, "VGA16 VGA");
+    info.smem_start = kVgaWindow;
+    info.smem_len = VgaModel::kWindow;
+    info.type = FB_TYPE_VGA_PLANES;
+    info.type_aux = FB_AUX_VGA_PLANES_VGA4;
+    info.visual = FB_VISUAL_PSEUDOCOLOR;
+    info.xpanstep = 8;
+    info.ypanstep = 1;
     info.line_length = state.mode.pitch;
     info.accel = FB_ACCEL_NONE;
     return info;
@@ -77,8 +96,11 @@ void FramebufferModel::ShowConsole(int console) const
     if (!Identify(state.framebufferFd, identity) || identity != state.framebuffer) return;
     std::array<unsigned char, 4096> colour{};
     colour.fill(static_cast<unsigned char>(0x55 + console));
-    std::size_t const end = std::size_t{state.mode.pitch} * state.mode.height;
-    for (std::size_t at = 0; at < end; at += colour.size())
+    bool const isPlanar = state.mode.depth == 4;
+    if (isPlanar) state.vga.latches = 0;  // its black has gone through them
+    std::size_t const begin = isPlanar ? kVgaPlanesOffset : 0;
+    std::size_t const end = begin + std::size_t{state.mode.pitch} * state.mode.height * (isPlanar ? 4 : 1);
+    for (std::size_t at = begin; at < end; at += colour.size())
         if (pwrite(state.framebufferFd, colour.data(), std::min(colour.size(), end - at),
                 static_cast<off_t>(at)) == -1)
             return;

@@ -26,6 +26,7 @@ public:
 
 private:
     fb_fix_screeninfo FixedInfo() const;
+    fb_fix_screeninfo PlanarFixedInfo() const;
     fb_var_screeninfo VariableInfo() const;
     int PutColourMap(fb_cmap const& map);
     int GetColourMap(fb_cmap const& map) const;

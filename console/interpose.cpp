@@ -5,8 +5,10 @@
 // checks for buffers define some of them.
 
 #include <console/device_calls.h>
+#include <console/vga_trap.h>
 
 #include <atomic>
+#include <csignal>
 #include <cstdarg>
 
 #include <dlfcn.h>
@@ -44,6 +46,8 @@ using CheckedOpenAtFunction = int (*)(int, char const*, int);
 using MapFunction = void* (*)(void*, size_t, int, int, int, off_t);
 using ControlFunction = int (*)(int, unsigned long, ...);
 using PortsFunction = int (*)(unsigned long, unsigned long, int);
+using ActionFunction = int (*)(int, struct sigaction const*, struct sigaction*);
+using MaskFunction = int (*)(int, sigset_t const*, sigset_t*);
 using WriteFunction = ssize_t (*)(int, void const*, size_t);
 
 /// Whether the call has a further argument, the permissions of a file that may be made.
@@ -103,7 +107,9 @@ bool HasPermissions(int flags) { return (flags & O_CREAT) != 0 || (flags & O_TMP
     {                                                                                                        \
         static constinit Next<MapFunction> next(symbol);                                                     \
         if (console::MapDevice(fd)) return MAP_FAILED;                                                       \
-        return next.Get()(address, length, protection, flags, fd, offset);                                   \
+        void* const memory = next.Get()(address, length, protection, flags, fd, offset);                     \
+        if (memory != MAP_FAILED) console::OnMapped(fd, memory, length);                                     \
+        return memory;                                                                                       \
     }
 
 CONSOLE_OPEN(ConsoleOpen, "open")
@@ -136,6 +142,28 @@ int ConsolePorts(unsigned long from, unsigned long count, int allowed)
     if (auto const result = console::AllowPorts(from, count)) return *result;
     return next.Get()(from, count, allowed);
 }
+
+CONSOLE_EXPORT int ConsoleAction(
+    int signal, struct sigaction const* action, struct sigaction* before) __asm__("sigaction");
+int ConsoleAction(int signal, struct sigaction const* action, struct sigaction* before)
+{
+    static constinit Next<ActionFunction> next("sigaction");
+    if (auto const result = console::HandleSignal(signal, action, before)) return *result;
+    return next.Get()(signal, action, before);
+}
+
+#define CONSOLE_MASK(function, symbol)                                                                       \
+    CONSOLE_EXPORT int function(int how, sigset_t const* set, sigset_t* before) __asm__(symbol);             \
+    int function(int how, sigset_t const* set, sigset_t* before)                                             \
+    {                                                                                                        \
+        static constinit Next<MaskFunction> next(symbol);                                                    \
+        if (set == nullptr || how == SIG_UNBLOCK) return next.Get()(how, set, before);                       \
+        sigset_t const left = console::WithoutOwnSignals(*set);                                              \
+        return next.Get()(how, &left, before);                                                               \
+    }
+
+CONSOLE_MASK(ConsoleThreadMask, "pthread_sigmask")
+CONSOLE_MASK(ConsoleProcessMask, "sigprocmask")
 
 CONSOLE_EXPORT ssize_t ConsoleWrite(int fd, void const* data, size_t length) __asm__("write");
 ssize_t ConsoleWrite(int fd, void const* data, size_t length)

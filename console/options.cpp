@@ -12,8 +12,9 @@ constexpr char kHelp[] =
 Runs a program on a virtual Linux console: a framebuffer, a tty with the console's requests, and a PS/2 mouse,
 at the device paths where programs look for them. No root, no device and no change to the program is needed.
 
-  --mode WIDTHxHEIGHTxDEPTH   the video mode, 1024x768x32 if not given. Depths: 8 (with a colour map), 15, 16,
-                              24 (three bytes a pixel) and 32 (24 bits of colour in four bytes)
+  --mode WIDTHxHEIGHTxDEPTH   the video mode, 1024x768x32 if not given. Depths: 4 (16 colours in the planes of
+                              a VGA; slow), 8 (with a colour map), 15, 16, 24 (three bytes a pixel) and 32
+                              (24 bits of colour in four bytes)
   --pitch BYTES               bytes from one row to the next, if more than the pixels need
   --screenshot FILE.png       when the program has ended, however it did, write what the screen shows
   --script FILE               do at the console what the file says: move the mouse, press its buttons, type
@@ -89,7 +90,7 @@ Problem Reader::ReadValue(std::string_view name, std::string_view value)
             return "the mode " + Quoted(value) +
                 " isn't supported; it is WIDTHxHEIGHTxDEPTH with a depth of 8, 15, 16, 24 or 32 and sides up "
                 "to " +
-                std::to_string(kLongestSide);
+                std::to_string(kLongestSide) + ", or 640x480x4 or another of 8 pixels a byte in 64 KiB";
         options.setup.mode = *mode;
     } else if (name == "--pitch") {
         pitch = ParseNumber(value);

@@ -22,10 +22,16 @@ std::uint32_t ReadPixel(unsigned char const* bytes, unsigned count)
     return pixel;
 }
 
-Shown ShowIndex(ColourMap const& colours, std::uint32_t index)
+using Converter = std::uint8_t (*)(std::uint16_t component);
+
+Shown ShowIndex(ColourMap const& colours, std::uint32_t index, Converter shown)
 {
-    return {ShownByConverter(colours.red[index]), ShownByConverter(colours.green[index]),
-        ShownByConverter(colours.blue[index])};
+    return {shown(colours.red[index]), shown(colours.green[index]), shown(colours.blue[index])};
+}
+
+void Append(Picture& picture, Shown shown)
+{
+    picture.bytes.insert(picture.bytes.end(), {shown.red, shown.green, shown.blue});
 }
 
 std::uint8_t ShowField(std::uint32_t pixel, ColourField field, unsigned depth)
@@ -37,6 +43,15 @@ Shown ShowPacked(PixelFormat const& format, unsigned depth, std::uint32_t pixel)
 {
     return {ShowField(pixel, format.red, depth), ShowField(pixel, format.green, depth),
         ShowField(pixel, format.blue, depth)};
+}
+
+/// Four bytes, one a plane, stand for 8 pixels, the leftmost in the highest bits.
+void ShowPlanes(Picture& picture, ColourMap const& colours, std::span<unsigned char const> planes)
+{
+    for (std::size_t at = 0; at < std::size_t{picture.width} * picture.height; ++at) {
+        auto const word = ReadPixel(&planes[at / 8 * 4], 4);
+        Append(picture, ShowIndex(colours, VgaModel::PixelOf(word, 7 - at % 8), ShownByNarrowConverter));
+    }
 }
 
 }
@@ -51,15 +66,19 @@ Picture TakePicture(DisplayMode const& mode, ColourMap const& colours, std::span
 {
     Picture picture{mode.width, mode.height, {}};
     picture.bytes.reserve(std::size_t{mode.width} * mode.height * 3);
+    if (mode.depth == 4) {
+        ShowPlanes(picture, colours, memory);
+        return picture;
+    }
     auto const format = FormatOf(mode.depth);
     unsigned const step = BytesPerPixel(mode.depth);
     for (unsigned y = 0; y < mode.height; ++y) {
         auto const row = memory.subspan(std::size_t{y} * mode.pitch, std::size_t{mode.width} * step);
         for (std::size_t at = 0; at < row.size(); at += step) {
             auto const pixel = ReadPixel(&row[at], step);
-            auto const shown =
-                mode.depth == 8 ? ShowIndex(colours, pixel) : ShowPacked(format, mode.depth, pixel);
-            picture.bytes.insert(picture.bytes.end(), {shown.red, shown.green, shown.blue});
+            auto const shown = mode.depth == 8 ? ShowIndex(colours, pixel, ShownByConverter)
+                                               : ShowPacked(format, mode.depth, pixel);
+            Append(picture, shown);
         }
     }
     return picture;

@@ -22,7 +22,7 @@ struct Picture {
 };
 
 /// Shows video memory as the screen does; the colour map counts in modes with one. The memory holds all of
-/// the mode's rows.
+/// the mode's rows; in the 4-plane mode, the words of its planes.
 Picture TakePicture(DisplayMode const& mode, ColourMap const& colours, std::span<unsigned char const> memory);
 
 /// Writes a PNG file. Gives an empty text, or why the file couldn't be written; it is then gone.

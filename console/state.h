@@ -2,6 +2,7 @@
 
 #include <console/display_mode.h>
 #include <console/request.h>
+#include <console/vga_model.h>
 
 #include <array>
 #include <atomic>
@@ -51,6 +52,13 @@ struct ColourMap {
     std::array<std::uint16_t, 256> red{}, green{}, blue{};
 };
 
+/// The video memory is one file. A program maps it from its start; behind all that it can map lie the planes
+/// of the 4-plane mode, a word for each byte of its window.
+inline constexpr std::size_t kVideoMemory =
+    std::size_t{2} * kLongestPitch * kLongestSide;  // enough for every mode
+inline constexpr std::size_t kVgaPlanesOffset = kVideoMemory;
+inline constexpr std::size_t kVgaPlanesLength = VgaModel::kWindow * sizeof(std::uint32_t);
+
 /// All that the devices know. It lies in memory that the tool and the program share, so that the tool can
 /// look at it while the program runs and after it has died; it therefore holds no pointers.
 struct State {
@@ -73,6 +81,7 @@ struct State {
     DisplayMode mode;
     PixelFormat format;  ///< as told to the program; not always that of the mode
     ColourMap colourMap;
+    VgaState vga;  ///< changed by the program's accesses alone, one at a time, and not locked
     TtyState ttyState;
     MouseState mouseState;
     std::array<int, kFaultSlots> faults{};              ///< an error number, or 0

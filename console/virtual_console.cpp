@@ -19,8 +19,19 @@ namespace console {
 
 namespace {
 
-/// Enough for every mode.
-constexpr std::size_t kVideoMemory = std::size_t{2} * kLongestPitch * kLongestSide;
+/// What the adapter's converter begins with: the text colours, red and blue exchanged in the index.
+constexpr ColourMap TextColours()
+{
+    ColourMap map;
+    for (unsigned i = 0; i < 16; ++i) {
+        unsigned const bright = i & 8 ? 0x5555 : 0;
+        map.red[i] = static_cast<std::uint16_t>((i & 4 ? 0xAAAA : 0) + bright);
+        map.green[i] = static_cast<std::uint16_t>((i & 2 ? 0xAAAA : 0) + bright);
+        map.blue[i] = static_cast<std::uint16_t>((i & 1 ? 0xAAAA : 0) + bright);
+    }
+    map.green[6] = 0x5555;  // brown
+    return map;
+}
 
 FileIdentity IdentityOf(int fd)
 {
@@ -55,8 +66,7 @@ void VirtualConsole::MakeState(Setup const& setup)
         OwnedMapping(stateFd.Get(), sizeof(State), OwnedMapping::Access::Write, "making the console's state");
     state = new (stateMemory.Get()) State;
     InitMutex(*state);
-    state->mode = setup.mode;
-    state->format = setup.format.value_or(FormatOf(setup.mode.depth));
+    SetMode(setup.mode, setup.format);
     for (auto const& fault : setup.faults)
         state->faults[fault.slot] = fault.error;
 }
@@ -66,9 +76,10 @@ void VirtualConsole::MakeFramebuffer()
     // Video memory has one length for all modes and cannot be cut; pages that nobody touches cost nothing.
     framebuffer = OwnedFd(memfd_create("tessella-console-fb", MFD_ALLOW_SEALING), "making video memory");
     int const fd = framebuffer.Get();
-    Checked(ftruncate(fd, kVideoMemory), "making video memory");
+    constexpr std::size_t kLength = kVgaPlanesOffset + kVgaPlanesLength;
+    Checked(ftruncate(fd, kLength), "making video memory");
     Checked(fcntl(fd, F_ADD_SEALS, F_SEAL_SHRINK | F_SEAL_GROW), "making video memory");
-    pixels = OwnedMapping(fd, kVideoMemory, OwnedMapping::Access::Read, "making video memory");
+    pixels = OwnedMapping(fd, kLength, OwnedMapping::Access::Read, "making video memory");
     state->framebufferFd = fd;
     std::snprintf(state->framebufferPath.data(), state->framebufferPath.size(), "/proc/self/fd/%d", fd);
     state->framebuffer = IdentityOf(fd);
@@ -132,8 +143,14 @@ unsigned VirtualConsole::CountOpens(char const* path)
 void VirtualConsole::ChangeMode(DisplayMode const& mode, std::optional<PixelFormat> const& format)
 {
     StateLock const lock(*state);
+    SetMode(mode, format);
+}
+
+void VirtualConsole::SetMode(DisplayMode const& mode, std::optional<PixelFormat> const& format)
+{
     state->mode = mode;
     state->format = format.value_or(FormatOf(mode.depth));
+    if (mode.depth == 4) state->colourMap = TextColours();
 }
 
 TtyState VirtualConsole::Tty()
@@ -170,8 +187,9 @@ Picture VirtualConsole::Screen()
         mode = state->mode;
         colours = state->colourMap;
     }
-    return TakePicture(mode, colours,
-        {static_cast<unsigned char const*>(pixels.Get()), std::size_t{mode.pitch} * mode.height});
+    auto const* const memory = static_cast<unsigned char const*>(pixels.Get());
+    if (mode.depth == 4) return TakePicture(mode, colours, {memory + kVgaPlanesOffset, kVgaPlanesLength});
+    return TakePicture(mode, colours, {memory, std::size_t{mode.pitch} * mode.height});
 }
 
 bool VirtualConsole::TypeKeys(std::span<unsigned char const> bytes)

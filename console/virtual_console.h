@@ -89,6 +89,7 @@ private:
     void MakeFramebuffer();
     void MakeTty();
     void MakeMouse();
+    void SetMode(DisplayMode const& mode, std::optional<PixelFormat> const& format);
 
     OwnedFd stateFd, framebuffer, ttyMaster, ttySlave, mouseProgram, mouseDevice;
     OwnedMapping stateMemory, pixels;

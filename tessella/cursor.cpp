@@ -21,21 +21,6 @@
 //            |       top      |
 //            +----------------+ old place
 
-namespace {
-
-GrRect Limited(GrRect rect)
-{
-    rect.x1 = std::max(rect.x1, 0);
-    rect.y1 = std::max(rect.y1, 0);
-    rect.x2 = std::min(rect.x2, static_cast<int>(GrScreen.width));
-    rect.y2 = std::min(rect.y2, static_cast<int>(GrScreen.height));
-    rect.x1 = std::min(rect.x1, rect.x2);
-    rect.y1 = std::min(rect.y1, rect.y2);
-    return rect;
-}
-
-}
-
 GrCursor::GrCursor(GrImage* shape, GrBitmap* shapeMask, int hotSpotX, int hotSpotY)
     : image(shape), mask(shapeMask), hotX(hotSpotX), hotY(hotSpotY),
       composeImage(std::make_unique<GrImage>(shape->width, shape->height, 0)),
@@ -69,6 +54,17 @@ void GrCursor::Activate()
     y = atY;
     if (first) GrShowCursor();  // not only drawn, but known to be: a change of mode has hidden the one before
     hideCount.fetch_sub(1, std::memory_order_relaxed);
+}
+
+GrRect GrCursor::Limited(GrRect rect)
+{
+    rect.x1 = std::max(rect.x1, 0);
+    rect.y1 = std::max(rect.y1, 0);
+    rect.x2 = std::min(rect.x2, static_cast<int>(GrScreen.width));
+    rect.y2 = std::min(rect.y2, static_cast<int>(GrScreen.height));
+    rect.x1 = std::min(rect.x1, rect.x2);
+    rect.y1 = std::min(rect.y1, rect.y2);
+    return rect;
 }
 
 GrRect GrCursor::PlaceAt(int atX, int atY) const
@@ -115,8 +111,8 @@ void GrCursor::Move(int newX, int newY)
     oldX = x;
     oldY = y;
     GrRect const next = PlaceAt(newX, newY);
-    if (next.x1 < fullRect.x2 && next.x1 > SeenFrom(fullRect.x1, image->width) && next.y1 < fullRect.y2 &&
-        next.y1 > SeenFrom(fullRect.y1, image->height)) {
+    if (GrScreen.depth != 4 && next.x1 < fullRect.x2 && next.x1 > SeenFrom(fullRect.x1, image->width) &&
+        next.y1 < fullRect.y2 && next.y1 > SeenFrom(fullRect.y1, image->height)) {
         PlanShortMove(next);
         RestoreRect(restoreTopRect);
         RestoreRect(restoreSideRect);

@@ -1,18 +1,8 @@
-#include <tessella/cursor.h>
+#include <tessella/cursor_kinds.h>
+
+#include <tessella/screen.h>
 
 namespace {
-
-class GrMaskedCursor : public GrCursor {
-public:
-    GrMaskedCursor(GrImage* shape, GrBitmap* shapeMask, int hotSpotX, int hotSpotY)
-        : GrCursor(shape, shapeMask, hotSpotX, hotSpotY)
-    {}
-    ~GrMaskedCursor() override { Retire(); }
-    void DrawShape(GrContext* target, GrRect const& where, int sx, int sy) override
-    {
-        target->DrawImageMaskedDirect(where, *image, *mask, sx, sy);
-    }
-};
 
 class GrAlphaCursor : public GrCursor {
 public:
@@ -28,8 +18,14 @@ public:
 
 }
 
+void GrMaskedCursor::DrawShape(GrContext* target, GrRect const& where, int sx, int sy)
+{
+    target->DrawImageMaskedDirect(where, *image, *mask, sx, sy);
+}
+
 GrCursor* GrCursor::CreateInstance(GrImage* image, GrBitmap* mask, int hotX, int hotY)
 {
     if (!mask) return new GrAlphaCursor(image, hotX, hotY);
+    if (GrScreen.depth < 5) return new GrMaskedCursor4(image, mask, hotX, hotY);
     return new GrMaskedCursor(image, mask, hotX, hotY);
 }

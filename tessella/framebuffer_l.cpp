@@ -4,6 +4,7 @@
 #include <tessella/screen.h>
 #include <tessella/screen_guard.h>
 #include <tessella/session_state.h>
+#include <tessella/vga_l.h>
 #include <tessella/video_mode.h>
 #include <tessella/whole_screen.h>
 #include <tessella/window.h>
@@ -113,10 +114,14 @@ bool GrSetVideoMode(unsigned& width, unsigned& height, unsigned& depth, unsigned
     GrScreen.bytesPerPixel = mode->bytesPerPixel;
     GrScreen.createScreenContext = mode->createScreenContext;
     GrScreen.createImageContext = mode->createImageContext;
+    if (mode->depth == 4) GrScreen.stride = GrScreen.width >> 3;
     if (mode->depth == 8) LoadColorMap();
 
     GrScreen.context = GrScreen.createScreenContext(WholeScreen(), 0, 0);
     if (GrScreen.bytesPerPixel <= 2) GrScreen.ditherLine = new std::int32_t[std::size_t{GrScreen.width} * 3];
+    if (mode->depth == 4)
+        for (unsigned const word : {GrVgaEnableSetReset, GrVgaReplace, GrVgaWritePixels})
+            WriteVgaPort(word);
 
     width = GrScreen.width;
     height = GrScreen.height;

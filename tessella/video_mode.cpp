@@ -13,6 +13,8 @@ constexpr GrVideoMode Row(unsigned bits, unsigned colorBits, unsigned depth)
 }
 
 constexpr GrVideoMode kModes[] = {
+    {4, GrVideoMode::kAnyColorBits, 4, 1, CreatePlanarScreenContext,
+        CreateImageContext<GrSurface8, GrColors4>},
     Row<GrSurface8, GrColors8>(8, GrVideoMode::kAnyColorBits, 8),
     Row<GrSurface16, GrColors15>(16, 15, 15),
     Row<GrSurface16, GrColors16>(16, 16, 16),

@@ -59,6 +59,11 @@ protected:
     /// mouse's thread may be drawing the shape.
     GR_INTERNAL void Retire();
 
+    /// Where the shape lies with its hot spot at a point of the screen.
+    GR_INTERNAL GrRect PlaceAt(int atX, int atY) const;
+    /// What of a rectangle is on the screen; empty where nothing is.
+    GR_INTERNAL static GrRect Limited(GrRect rect);
+
     std::unique_ptr<GrImage> const image;  ///< the shape
     std::unique_ptr<GrBitmap> const mask;  ///< null for shapes with alpha
     std::int32_t const hotX;               ///< the hot spot, in the image
@@ -85,7 +90,6 @@ private:
     friend class GrScreenGuard;
     friend void GrHideCursor();
 
-    GR_INTERNAL GrRect PlaceAt(int atX, int atY) const;
     GR_INTERNAL void PlanShortMove(GrRect const& next);
     GR_INTERNAL void ShowAfterShortMove(int left, int top);
 };

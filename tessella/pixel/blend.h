@@ -36,9 +36,10 @@ constexpr GrColor Mixed(GrColor source, GrColor destination, unsigned rest)
     return red | green | blue | 0xFF000000;
 }
 
-/// Blends pixel by pixel: the plain form, whose pixels every faster one has to give.
-template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
-void BlendPixels(GrBlend const& blend)
+/// Blends pixel by pixel, where `read` and `write` get at a row's pixels; columns count from the target's
+/// first one.
+template <GrColorsPolicy Colors, typename Read, typename Write>
+void BlendEach(GrBlend const& blend, Read read, Write write)
 {
     using Pixel = typename Colors::Pixel;
     auto const forePixel = static_cast<Pixel>(blend.fore), backPixel = static_cast<Pixel>(blend.back);
@@ -53,7 +54,7 @@ void BlendPixels(GrBlend const& blend)
             std::ptrdiff_t const index = y * blend.sourceWidth + x;
             unsigned const alpha = blend.alphas ? blend.alphas[index] : blend.alpha;
             if (alpha == 0) {
-                if (!blend.overDestination) Surface::WritePixel(row, x, backPixel);
+                if (!blend.overDestination) write(row, x, backPixel);
                 continue;
             }
             GrColor color = fore;
@@ -63,14 +64,22 @@ void BlendPixels(GrBlend const& blend)
                 pixel = blend.colors ? Colors::ToPixel(color) : forePixel;
             } else {
                 if (!blend.colors || !blend.alphas) color = Faded(color, alpha);
-                GrColor const below = blend.overDestination
-                    ? Colors::FromPixel(static_cast<Pixel>(Surface::ReadPixel(row, x)))
-                    : back;
+                GrColor const below =
+                    blend.overDestination ? Colors::FromPixel(static_cast<Pixel>(read(row, x))) : back;
                 color = Mixed(color, below, 255 - alpha);
                 pixel = Colors::ToPixel(color);
             }
             if (errors) pixel = errors->Diffuse<Colors>(color, x);
-            Surface::WritePixel(row, x, pixel);
+            write(row, x, pixel);
         }
     }
+}
+
+/// The plain form, whose pixels every faster one has to give.
+template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
+void BlendPixels(GrBlend const& blend)
+{
+    BlendEach<Colors>(
+        blend, [](unsigned char const* row, int x) { return Surface::ReadPixel(row, x); },
+        [](unsigned char* row, int x, auto pixel) { Surface::WritePixel(row, x, pixel); });
 }

@@ -30,16 +30,21 @@ void GrGenericContextBase<S>::DrawBits(int x, int y, GrBits const& bits, bool tr
     GrRect const box{x, y, Moved(x, bits.width), Moved(y, bits.height)};
     WalkClip(box, 0, 0, [&](GrRange xRange, GrRange yRange, int firstColumn, int bitsRow) {
         unsigned char* row = this->RowAddress(yRange.r1);
-        if (!transparent || this->IsSolid())
-            return PaintBits<typename S::Width>({{this->PixelAddress(row, xRange.r1), this->Stride(),
-                                                     xRange.r2 - xRange.r1, yRange.r2 - yRange.r1},
-                bits, firstColumn, bitsRow, this->foreColor, this->backColor, transparent});
+        if constexpr (S::kPacked)
+            if (!transparent || this->IsSolid())
+                return PaintBits<typename S::Width>({{this->PixelAddress(row, xRange.r1), this->Stride(),
+                                                         xRange.r2 - xRange.r1, yRange.r2 - yRange.r1},
+                    bits, firstColumn, bitsRow, this->foreColor, this->backColor, transparent});
         for (int rowY = yRange.r1; rowY < yRange.r2; ++rowY, ++bitsRow, row += this->Stride()) {
             std::uint8_t const patternByte = this->pattern[rowY & 7];
             int column = firstColumn;
-            for (int pixelX = xRange.r1; pixelX < xRange.r2; ++pixelX, ++column)
-                if (bits.IsSet(bitsRow, column))
+            for (int pixelX = xRange.r1; pixelX < xRange.r2; ++pixelX, ++column) {
+                bool const set = bits.IsSet(bitsRow, column);
+                if (!transparent)
+                    this->WritePixel(row, pixelX, set ? this->foreColor : this->backColor);
+                else if (set)
                     this->PatternPixel(row, pixelX, patternByte, this->patternTransparent, this->rasterMode);
+            }
         }
     });
 }
@@ -67,7 +72,7 @@ void GrGenericContextBase<S>::MaskedRows(
     unsigned char* row = this->RowAddress(yRange.r1);
     for (int y = yRange.r1; y < yRange.r2; ++y, ++sy, source += imageStride, row += this->Stride())
         for (int x = xRange.r1, column = sx; x < xRange.r2; ++x, ++column)
-            if (bits.IsSet(sy, column)) this->WritePixel(row, x, this->ReadPixel(source, column));
+            if (bits.IsSet(sy, column)) this->WritePixel(row, x, S::Width::ReadPixel(source, column));
 }
 
 template <typename S>

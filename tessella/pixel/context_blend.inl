@@ -27,9 +27,9 @@ template <typename S, GrColorsPolicy Colors>
 void GrGenericContext<S, Colors>::BlendRange(
     GrRange xRange, GrRange yRange, GrImage const* image, int sx, int sy, GrBlendParams const& params) const
 {
-    GrBlend blend{{this->PixelAddress(this->RowAddress(yRange.r1), xRange.r1), this->Stride(),
-                      xRange.r2 - xRange.r1, yRange.r2 - yRange.r1},
-        nullptr, nullptr, 0, params.alpha, params.overDestination, this->foreColor, this->backColor,
+    unsigned char* const row = this->RowAddress(yRange.r1);
+    GrBlend blend{{row, this->Stride(), xRange.r2 - xRange.r1, yRange.r2 - yRange.r1}, nullptr, nullptr, 0,
+        params.alpha, params.overDestination, this->foreColor, this->backColor,
         params.dither && Colors::kDithers ? this->ErrorRows() : nullptr};
     if (image) {
         std::ptrdiff_t const first = std::ptrdiff_t{sy} * image->width + sx;
@@ -37,5 +37,15 @@ void GrGenericContext<S, Colors>::BlendRange(
         if (image->alphaPlane && !params.uniformAlpha) blend.alphas = image->alphaPlane + first;
         blend.sourceWidth = image->width;
     }
-    if (blend.alphas || params.uniformAlpha) BlendRows<typename S::Width, Colors>(blend);
+    if (!blend.alphas && !params.uniformAlpha) return;
+    if constexpr (S::kPacked) {
+        blend.target.address = this->PixelAddress(row, xRange.r1);
+        BlendRows<typename S::Width, Colors>(blend);
+    } else {
+        // What is there cannot be read, so all of it is over the back colour.
+        blend.overDestination = false;
+        BlendEach<Colors>(blend, S::ReadPixel, [left = xRange.r1](unsigned char* target, int x, auto pixel) {
+            S::WritePixel(target, left + x, pixel);
+        });
+    }
 }

@@ -71,7 +71,7 @@ void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* 
 {
     if (!source) return;
     GrColorSource const colorSource(*source);
-    bool const readAhead = colorSource.MayReadAhead(ExtentOfClip());
+    bool const readAhead = S::kPacked && colorSource.MayReadAhead(ExtentOfClip());
     this->WalkClip(
         this->OnSurface(dst), sx, sy, [&](GrRange xRange, GrRange yRange, int sourceX, int sourceY) {
             unsigned char* row = this->RowAddress(yRange.r1);
@@ -83,12 +83,14 @@ void GrGenericContext<S, Colors>::CopyFromContext(GrRect const& dst, GrContext* 
                             row, xRange.r1 + x, Colors::ToPixel(source->GetPixel(Moved(sourceX, x), rowY)));
                     continue;
                 }
-                GrColor room[1024];
-                for (int x = xRange.r1, count; x < xRange.r2; x += count) {
-                    count = std::min(xRange.r2 - x, static_cast<int>(std::size(room)));
-                    GrColor const* const colors =
-                        colorSource.Read(Moved(sourceX, x - xRange.r1), rowY, count, room);
-                    WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), count, colors);
+                if constexpr (S::kPacked) {
+                    GrColor room[1024];
+                    for (int x = xRange.r1, count; x < xRange.r2; x += count) {
+                        count = std::min(xRange.r2 - x, static_cast<int>(std::size(room)));
+                        GrColor const* const colors =
+                            colorSource.Read(Moved(sourceX, x - xRange.r1), rowY, count, room);
+                        WriteColors<typename S::Width, Colors>(this->PixelAddress(row, x), count, colors);
+                    }
                 }
             }
         });

@@ -37,9 +37,7 @@ void GrGenericContextBase<S>::FillRegion(GrRegion const& region)
         unsigned char* const top = this->RowAddress(band.r1);
         for (auto const& range : RangesOf(band)) {
             if (solid) {
-                this->FillRows({this->PixelAddress(top, range.r1), this->Stride(), range.r2 - range.r1,
-                                   band.r2 - band.r1},
-                    this->foreColor);
+                this->FillRange(range, {band.r1, band.r2}, this->foreColor);
                 continue;
             }
             unsigned char* row = top;

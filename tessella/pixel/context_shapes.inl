@@ -65,13 +65,10 @@ void GrGenericContextBase<S>::DrawColumn(GrRegion const& region, int x) const
 {
     for (auto const& band : BandsOf(region)) {
         if (band.item_count == 0) continue;
-        if (this->rasterMode == GrRasterModeCopy) {
+        if (this->rasterMode == GrRasterModeCopy)
             this->PatternColumn(x, band.r1, band.r2 - band.r1, this->foreColor, this->backColor);
-            continue;
-        }
-        unsigned char* row = this->RowAddress(band.r1);
-        for (int y = band.r1; y < band.r2; ++y, row += this->Stride())
-            this->PatternPixel(row, x, this->pattern[y & 7], this->patternTransparent, this->rasterMode);
+        else
+            this->InvertColumn(x, band.r1, band.r2 - band.r1);
     }
 }
 
@@ -79,12 +76,16 @@ void GrGenericContextBase<S>::DrawColumn(GrRegion const& region, int x) const
 template <typename S>
 void GrGenericContextBase<S>::DrawRun(GrLineWalker line, std::uint64_t count) const
 {
-    if (!this->IsSolid()) {
-        for (; count > 0; --count, line.Step())
-            this->PatternPixel(this->RowAddress(line.y), line.x, this->pattern[line.y & 7],
-                this->patternTransparent, this->rasterMode);
-        return;
-    }
+    if constexpr (S::kPacked)
+        if (this->IsSolid()) return DrawSolidRun(line, count);
+    for (; count > 0; --count, line.Step())
+        this->PatternPixel(this->RowAddress(line.y), line.x, this->pattern[line.y & 7],
+            this->patternTransparent, this->rasterMode);
+}
+
+template <typename S>
+void GrGenericContextBase<S>::DrawSolidRun(GrLineWalker const& line, std::uint64_t count) const
+{
     unsigned char* address = this->PixelAddress(this->RowAddress(line.y), line.x);
     std::ptrdiff_t const along = line.longX * S::kBytes + line.longY * this->Stride();
     std::ptrdiff_t const turn = along + line.shortX * S::kBytes + line.shortY * this->Stride();
@@ -126,12 +127,14 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     auto* const base = this->PixelBase();
     auto const pitch = static_cast<std::uint32_t>(this->Stride());
     GrArcState arc;
-    GrRect const box{x, y, Moved(x, w), Moved(y, h)};
-    if (IsWholeTurn(sweep) && this->IsSolid() && IsOneRectangle(this->clip) &&
-        CoverageOf(box, this->clip) == Coverage::All) {
-        typename S::Guard const guard(box);
-        WalkSetup(arc, x, y, w, h, base, pitch);
-        return DrawOutline(arc);
+    if constexpr (S::kPacked) {
+        GrRect const box{x, y, Moved(x, w), Moved(y, h)};
+        if (IsWholeTurn(sweep) && this->IsSolid() && IsOneRectangle(this->clip) &&
+            CoverageOf(box, this->clip) == Coverage::All) {
+            typename S::Guard const guard(box);
+            WalkSetup(arc, x, y, w, h, base, pitch);
+            return DrawOutline(arc);
+        }
     }
     ArcSetup(arc, x, y, w, h, start, sweep, base, pitch, this->clip);
     GrRegion const& region = arc.region;
@@ -141,8 +144,10 @@ void GrGenericContextBase<S>::DrawArc(int x, int y, int w, int h, int start, int
     Coverage quadrants[4];
     for (int q = 0; q < 4; ++q)
         quadrants[q] = CoverageOf(QuadrantBox(q, x, y, w, h), region);
-    auto const isWhole = [](Coverage coverage) { return coverage == Coverage::All; };
-    if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) return DrawOutline(arc);
+    if constexpr (S::kPacked) {
+        auto const isWhole = [](Coverage coverage) { return coverage == Coverage::All; };
+        if (this->IsSolid() && std::all_of(quadrants, quadrants + 4, isWhole)) return DrawOutline(arc);
+    }
     WalkOutline(walk, [&](int quadrant, std::uintptr_t address, int column, int line) {
         Coverage const coverage = quadrants[quadrant];
         if (coverage == Coverage::All || (coverage == Coverage::Part && region.Contains(column, line)))

@@ -93,9 +93,7 @@ private:
 
     void FillRange(GrRange const& columns, GrRange const& rows)
     {
-        context.FillRows({context.PixelAddress(context.RowAddress(rows.r1), columns.r1), context.Stride(),
-                             columns.r2 - columns.r1, rows.r2 - rows.r1},
-            context.backColor);
+        context.FillRange(columns, rows, context.backColor);
     }
 
     GrGenericContextBase& context;
@@ -207,8 +205,9 @@ void GrGenericContextBase<S>::DrawCharacters(
     int const top = SeenFrom(baseline, static_cast<int>(font.GetAscent()));
 
     typename S::TextGuard const guard(*this);
-    bool const gapsLast = !transparent && (bold || !GoesForward(font, text, length));
-    bool const collects = transparent && !bold && this->IsSolid();
+    // Where pixels are not packed, a store may reach others of its byte, so that the order is seen.
+    bool const gapsLast = !transparent && (!S::kPacked || bold || !GoesForward(font, text, length));
+    bool const collects = S::kPacked && transparent && !bold && this->IsSolid();
     TextInk ink(*this);
     TextBack back(*this, pen, top, Moved(top, static_cast<int>(font.GetHeight())), gapsLast);
     GrGlyphInfo glyph;

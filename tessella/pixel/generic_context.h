@@ -85,6 +85,7 @@ private:
     }
     void DrawColumn(GrRegion const& region, int x) const;
     void DrawRun(GrLineWalker line, std::uint64_t count) const;
+    void DrawSolidRun(GrLineWalker const& line, std::uint64_t count) const;
     void DrawOutline(GrArcState const& arc) const;
     template <typename Paint>
     static void WalkOutline(GrEllipseWalk walk, Paint paint);

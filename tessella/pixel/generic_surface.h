@@ -21,6 +21,7 @@ public:
     using Surface::kAllBits;
     using Surface::kBytes;
     using typename Surface::Pixel;
+    static constexpr bool kPacked = true;  ///< each pixel has bytes of its own, at `PixelAddress`
 
     using Base::Base;
 
@@ -58,6 +59,17 @@ protected:
     /// Paints `count` pixels downward from `x`, `y` with the context's pattern in the two given pixels. The
     /// raster mode is not looked at: callers that invert do so themselves.
     void PatternColumn(int x, int y, int count, Pixel setPixel, Pixel clearPixel) const;
+
+    /// Complements `count` pixels downward from `x`, `y`: those that the context's pattern would paint.
+    void InvertColumn(int x, int y, int count) const;
+
+    /// Fills a rectangle, whatever pattern and raster mode are.
+    void FillRange(GrRange xRange, GrRange yRange, Pixel pixel) const
+    {
+        FillRows({PixelAddress(RowAddress(yRange.r1), xRange.r1), this->Stride(), xRange.r2 - xRange.r1,
+                     yRange.r2 - yRange.r1},
+            pixel);
+    }
 
     /// Copies the rows of a rectangle from an image of the same format, whose `sx`, `sy` goes to its top
     /// left.

@@ -56,6 +56,14 @@ void GrGenericSurface<Base, Surface>::PatternColumn(
 }
 
 template <typename Base, GrSurfacePolicy Surface>
+void GrGenericSurface<Base, Surface>::InvertColumn(int x, int y, int count) const
+{
+    unsigned char* row = RowAddress(y);
+    for (int const end = y + count; y < end; ++y, row += this->Stride())
+        PatternPixel(row, x, this->pattern[y & 7], this->patternTransparent, this->rasterMode);
+}
+
+template <typename Base, GrSurfacePolicy Surface>
 void GrGenericSurface<Base, Surface>::CopyRowsIn(
     GrRange xRange, GrRange yRange, GrImage const& image, int sx, int sy) const
 {

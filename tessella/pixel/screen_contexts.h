@@ -10,3 +10,6 @@ class GrContext;
 /// fits only a mode of its own pixel format. The caller deletes it. Instantiated for every packed mode.
 template <GrSurfacePolicy Surface, GrColorsPolicy Colors>
 GrContext* CreateScreenContext(GrRegion const& region, int x, int y);
+
+/// The same for the 16-colour mode, whose screen is not packed.
+GrContext* CreatePlanarScreenContext(GrRegion const& region, int x, int y);

@@ -42,7 +42,8 @@ TEST(Framebuffer, DriverTellsEachModeAsTheVesaDriverDoesAlsoWhenItChangesUnderAP
     struct {
         char const *mode, *format;
         std::vector<long> told;  // of each field but blue the offset before the length
-    } const cases[] = {{"40x30x8", "", {40, 30, 8, 0, 8, 0, 8, 8, 0, 8, FB_VISUAL_PSEUDOCOLOR, 40, 2400}},
+    } const cases[] = {{"40x30x4", "", {40, 30, 4, 0, 6, 0, 6, 6, 0, 0, FB_VISUAL_PSEUDOCOLOR, 5, 65536}},
+        {"40x30x8", "", {40, 30, 8, 0, 8, 0, 8, 8, 0, 8, FB_VISUAL_PSEUDOCOLOR, 40, 2400}},
         {"41x30x15", "", {41, 30, 16, 10, 5, 5, 5, 5, 15, 1, FB_VISUAL_TRUECOLOR, 82, 4920}},
         {"40x31x16", "", {40, 31, 16, 11, 5, 5, 6, 5, 0, 0, FB_VISUAL_TRUECOLOR, 80, 4960}},
         {"40x30x24", "", {40, 30, 24, 16, 8, 8, 8, 8, 0, 0, FB_VISUAL_TRUECOLOR, 120, 7200}},

@@ -223,7 +223,7 @@ TEST(Session, UnsupportedModesAreRefusedWithTheirNumbers)
     for (auto const& c :
         {Case{"640x480x24", "24:5,6,5", "TESSELLA: unsupported video mode 640x480x24(16).\n"},
             Case{"640x480x32", "32:10,10,10", "TESSELLA: unsupported video mode 640x480x32(30).\n"},
-            Case{"640x480x8", "4:8,8,8", "TESSELLA: unsupported video mode 640x480x4(24).\n"}}) {
+            Case{"640x480x8", "2:8,8,8", "TESSELLA: unsupported video mode 640x480x2(24).\n"}}) {
         auto const outcome = OnConsole(c.mode, c.format, [](console::VirtualConsole&) {
             Sizes sizes;
             EXPECT_FALSE(Init(sizes));

@@ -1,11 +1,14 @@
 // Fills the framebuffer, past the library, with every pixel value of up to 16 bits, or a spread of the wider
-// ones: in each format two consoles must show the same colour for the same bytes. What the driver tells of
-// the screen goes to the standard output first, since consoles must agree on that as well.
+// ones: in each format two consoles must show the same colour for the same bytes. With 4 planes, everything
+// that a program can tell the graphics controller comes in random order. What the driver tells of the screen
+// goes to the standard output first, since consoles must agree on that as well.
 //
-//   framebuffer_pattern [--hold]    --hold: says "ready" when the picture stands, ends after a line of input
+//   framebuffer_pattern [--hold]     --hold: says "ready" when the picture stands, ends after a line of input
+//   framebuffer_pattern --reset      only resets the graphics controller
 
 #include <fcntl.h>
 #include <linux/fb.h>
+#include <sys/io.h>
 #include <sys/ioctl.h>
 #include <sys/mman.h>
 #include <unistd.h>
@@ -14,6 +17,7 @@
 #include <cstdint>
 #include <cstdio>
 #include <cstring>
+#include <random>
 
 namespace {
 
@@ -57,6 +61,32 @@ void Fill(unsigned char* memory, unsigned stride, fb_var_screeninfo const& scree
     }
 }
 
+void ResetController(unsigned char const volatile* blackByte)
+{
+    for (unsigned short const word : {0x0000, 0x0001, 0x0002, 0x0003, 0x0004, 0x0005, 0x0F07, 0xFF08})
+        outw(word, 0x3CE);
+    static_cast<void>(*blackByte);
+}
+
+void FillPlanes(unsigned char volatile* memory, unsigned visible)
+{
+    static constexpr std::array kRegisters = {0, 1, 2, 3, 4, 5, 7, 8};
+    std::mt19937 random;
+    unsigned loaded = 0;
+    for (int i = 0; i < 80000; ++i) {
+        unsigned const chosen = random() % 8, offset = random() % visible, byte = random() & 0xFF;
+        if (chosen == 0)
+            loaded = loaded * 31 + memory[offset];
+        else if (chosen >= 3)
+            memory[offset] = static_cast<unsigned char>(byte);
+        else {
+            unsigned const index = kRegisters[random() % kRegisters.size()];
+            outw(static_cast<unsigned short>((index == 5 ? byte & 0x0B : byte) << 8 | index), 0x3CE);
+        }
+    }
+    std::printf("loaded %08x\n", loaded);
+}
+
 }
 
 int main(int argc, char** argv)
@@ -69,7 +99,9 @@ int main(int argc, char** argv)
         std::perror("/dev/fb0");
         return 1;
     }
-    Tell(fixed, variable);
+    char const* const option = argc > 1 ? argv[1] : "";
+    bool const isReset = std::strcmp(option, "--reset") == 0;
+    if (!isReset) Tell(fixed, variable);
     if (variable.bits_per_pixel == 8 && !LoadColourMap(device)) {
         std::perror("loading the colour map");
         return 1;
@@ -79,8 +111,15 @@ int main(int argc, char** argv)
         std::perror("mapping /dev/fb0");
         return 1;
     }
-    Fill(static_cast<unsigned char*>(memory), fixed.line_length, variable);
-    if (argc > 1 && std::strcmp(argv[1], "--hold") == 0) {
+    auto* const bytes = static_cast<unsigned char*>(memory);
+    unsigned char const* const last = bytes + fixed.smem_len - 1;  // nobody stores there
+    if (variable.bits_per_pixel == 4 && ioperm(0x3CE, 2, 1) == 0) {
+        ResetController(last);
+        if (!isReset) FillPlanes(bytes, fixed.line_length * variable.yres);
+    } else if (!isReset) {
+        Fill(bytes, fixed.line_length, variable);
+    }
+    if (std::strcmp(option, "--hold") == 0) {
         std::puts("ready");
         std::fflush(stdout);
         std::getchar();

@@ -19,8 +19,16 @@ from pathlib import Path
 import picture
 from initramfs import Initramfs, MissingPart
 
-# The boot loader's number of the 1024x768 mode with so many bits a pixel.
-VGA_MODES = {8: 0x305, 15: 0x316, 16: 0x317, 24: 0x318, 32: 0x344}
+# The boot loader's number of the 1024x768 mode with so many bits a pixel; 640x480 with 4 planes.
+VGA_MODES = {4: 0x112, 8: 0x305, 15: 0x316, 16: 0x317, 24: 0x318, 32: 0x344}
+
+# In the guest, by their paths in what scripts/fetch-kernel left.
+MODULES = {"/mouse.ko": "modules/kernel/drivers/input/mouse/psmouse.ko"}
+PLANAR_MODULES = {
+    "/vgastate.ko": "modules/kernel/drivers/video/vgastate.ko",
+    "/vga16fb.ko": "modules/kernel/drivers/video/fbdev/vga16fb.ko",
+    "/vga_screen.ko": "vga_screen.ko",
+}
 
 # Linux has the PC's numbers for the keys up to F12, and its own for those that the PC numbers from 0x80 up:
 # KP_ENTER to right ALT, HOME to DELETE, PAUSE, and the last three of META and COMPOSE.
@@ -40,7 +48,7 @@ class MachineError(Exception):
 
 
 def boot(bits: int, programs: list[Path], kernel_folder: Path, work_folder: Path) -> "Machine":
-    """Starts a machine with a 1024x768 framebuffer of `bits` bits a pixel and waits until it takes commands.
+    """Starts a machine with a framebuffer of `bits` bits a pixel and waits until it takes commands.
 
     `programs` are put, with their libraries, at the paths they have here. `work_folder` (made if needed)
     takes the boot archive and console.log, the kernel's messages. Raises MissingPart or MachineError."""
@@ -50,12 +58,16 @@ def boot(bits: int, programs: list[Path], kernel_folder: Path, work_folder: Path
         raise MissingPart(f"{kernel} is missing: run scripts/fetch-kernel (Debian package linux-image-amd64)")
     work_folder.mkdir(parents=True, exist_ok=True)
     archive = work_folder / "initramfs.cpio"
-    _make_initramfs(programs, kernel_folder / "modules").write(archive)
+    modules = MODULES | (PLANAR_MODULES if bits == 4 else {})
+    _make_initramfs(programs, {path: kernel_folder / modules[path] for path in modules}).write(archive)
 
     machine = Machine(work_folder)
     try:
         machine.power_on(emulator, kernel, archive, VGA_MODES[bits])
         machine.wait_line("booted", BOOT_SECONDS)
+        for module in PLANAR_MODULES if bits == 4 else ():
+            if machine.run(f"insmod {module}")[0] != 0:
+                raise MachineError(f"the guest does not take {module}")
     except BaseException:
         machine.stop()
         raise
@@ -202,7 +214,7 @@ class Machine:
         return f"the emulator ended with status {self._emulator.returncode}: {reason}"
 
 
-def _make_initramfs(programs: list[Path], modules: Path) -> Initramfs:
+def _make_initramfs(programs: list[Path], modules: dict[str, Path]) -> Initramfs:
     busybox = Path(_tool("busybox", "busybox-static"))
     guest = Initramfs()
     for folder in ("bin", "dev", "proc", "sys", "tmp"):
@@ -210,7 +222,8 @@ def _make_initramfs(programs: list[Path], modules: Path) -> Initramfs:
     guest.add_program(busybox)
     guest.add_file("/bin/busybox", busybox)
     guest.add_file("/init", Path(__file__).with_name("init"))
-    guest.add_file("/mouse.ko", modules / "kernel/drivers/input/mouse/psmouse.ko")
+    for path, module in modules.items():
+        guest.add_file(path, module)
     for program in programs:
         guest.add_program(program)
     return guest

@@ -11,7 +11,7 @@ import machine
 import picture
 import script
 
-VIRTUAL_SECONDS = 60
+VIRTUAL_SECONDS = 200
 
 
 class Difference(Exception):
@@ -81,6 +81,7 @@ def compare_script(
         shutil.rmtree(folder, ignore_errors=True)
         folder.mkdir(parents=True)
     virtual_words = run_virtually(options, program, ["--script", path], virtual_folder, language)
+    real.run(f"{options.pattern} --reset")  # what the program before has left in an adapter is seen
     real_words = script.Player(real, real_folder, options.state).play(steps, program, language)
     if virtual_words != real_words:
         for folder, words in ((real_folder, real_words), (virtual_folder, virtual_words)):
@@ -102,7 +103,8 @@ def run_on_virtual_console(
 def run_virtually(
     options: argparse.Namespace, program: Path, further: list, folder: Path | None = None, language: str = "C"
 ) -> list[str]:
-    command = [options.console, "--mode", f"1024x768x{options.bits}", *further, "--", program]
+    size = "640x480" if options.bits == 4 else "1024x768"
+    command = [options.console, "--mode", f"{size}x{options.bits}", *further, "--", program]
     try:
         result = subprocess.run(
             command, stdout=subprocess.PIPE, stderr=subprocess.STDOUT, text=True, cwd=folder,

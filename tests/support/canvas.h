@@ -19,13 +19,14 @@ public:
         std::uint32_t allBits;
         std::function<std::uint32_t(GrColor)> toPixel;
         std::function<GrColor(std::uint32_t)> fromPixel;
+        bool readable = true;  // else the context sees 0 everywhere, and blends over the back colour
     };
     template <typename Surface, typename Colors>
     static Format FormatOf(int bits = Colors::kBits)
     {
         return {bits, Surface::kBytes, Colors::kDithers, Surface::kAllBits,
             [](GrColor c) { return Colors::ToPixel(c); },
-            [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); }};
+            [](std::uint32_t p) { return Colors::FromPixel(static_cast<typename Colors::Pixel>(p)); }, true};
     }
 
     /// Error diffusion, a pixel at a time: half to the right, half down.
@@ -116,7 +117,12 @@ public:
         x += originX;
         y += originY;
         if (!InClip(x, y)) return 0;
-        return format.fromPixel(Read(x, y));
+        return format.fromPixel(Seen(x, y));
+    }
+    std::uint32_t Seen(int x, int y) const { return format.readable ? Read(x, y) : 0; }
+    std::uint32_t Under(int x, int y, bool overDestination) const
+    {
+        return overDestination && format.readable ? Read(x, y) : back;
     }
 
     /// A pixel of the surface, wherever the clip lies; and painting it within the clip.

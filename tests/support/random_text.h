@@ -140,7 +140,7 @@ private:
 
     void Blend(int x, int y, int alpha, bool overDestination)
     {
-        std::uint32_t const under = overDestination ? canvas.Read(x, y) : canvas.back;
+        std::uint32_t const under = canvas.Under(x, y, overDestination);
         GrColor const mixed =
             Canvas::Mixed(canvas.format.fromPixel(canvas.fore), canvas.format.fromPixel(under), alpha, alpha);
         canvas.Write(x, y, alpha == 0 ? under : alpha == 255 ? canvas.fore : canvas.format.toPixel(mixed));

@@ -224,9 +224,10 @@ TEST(VideoMode, IsFoundByBitsFirstAndColourBitsThen)
     struct Case {
         unsigned bits, colorBits, depth, bytes;
     };
-    for (auto const& [bits, colorBits, depth, bytes] : {Case{8, 0, 8, 1}, {8, 24, 8, 1}, {16, 15, 15, 2},
-             {16, 16, 16, 2}, {24, 24, 24, 3}, {32, 24, 24, 4}, {4, 24, 0, 0}, {24, 16, 0, 0}, {32, 30, 0, 0},
-             {32, 32, 0, 0}, {16, 24, 0, 0}, {15, 15, 0, 0}, {16, 12, 0, 0}, {1, 3, 0, 0}}) {
+    for (auto const& [bits, colorBits, depth, bytes] :
+        {Case{4, 0, 4, 1}, {4, 24, 4, 1}, {8, 0, 8, 1}, {8, 24, 8, 1}, {16, 15, 15, 2}, {16, 16, 16, 2},
+            {24, 24, 24, 3}, {32, 24, 24, 4}, {24, 16, 0, 0}, {32, 30, 0, 0}, {32, 32, 0, 0}, {16, 24, 0, 0},
+            {15, 15, 0, 0}, {16, 12, 0, 0}, {1, 3, 0, 0}}) {
         auto const* const mode = FindVideoMode(bits, colorBits);
         EXPECT_EQ(mode ? mode->depth : 0, depth) << bits << ' ' << colorBits;
         EXPECT_EQ(mode ? mode->bytesPerPixel : 0, bytes);

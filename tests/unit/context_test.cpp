@@ -1,4 +1,5 @@
 #include <support/canvas.h>
+#include <support/planar_screen.h>
 #include <support/random_blits.h>
 #include <support/random_text.h>
 #include <support/seed.h>
@@ -116,8 +117,10 @@ private:
     std::mt19937 random;
 };
 
-/// `image` is what the context draws on, or null for a screen.
-void Judge(GrContext& context, GrImage const* image, unsigned char const* pixels, Canvas& canvas)
+/// `image` is what the context draws on, or null for a screen; `look` brings its pixels up to date.
+void Judge(
+    GrContext& context, GrImage const* image, unsigned char const* pixels, Canvas& canvas,
+    std::function<void()> const& look = [] {})
 {
     unsigned const seed = NewSeed();
     SCOPED_TRACE("seed " + std::to_string(seed));
@@ -129,6 +132,7 @@ void Judge(GrContext& context, GrImage const* image, unsigned char const* pixels
         if (step % 3 == 0) blits.Step();
         if (step % 3 == 1) text.Step();
         ASSERT_FALSE(testing::Test::HasFailure()) << "step " << step;
+        look();
         ASSERT_EQ(std::memcmp(pixels, canvas.memory.data(), canvas.memory.size()), 0) << "step " << step;
     }
 }
@@ -185,6 +189,25 @@ TEST(Contexts, ScreensOfEveryModeMatchTheCanvas)
     JudgeScreen<GrSurface16, GrColors16>(16, 16);
     JudgeScreen<GrSurface24, GrColors24>(24, 24);
     JudgeScreen<GrSurface32, GrColors24>(32, 24);
+}
+
+TEST(Contexts, ThePlanarScreenMatchesTheCanvas)
+{
+    Canvas::Format format = Canvas::FormatOf<GrSurface8, GrColors4>();
+    format.readable = false;
+    Canvas canvas(format, kWidth, kHeight, kWidth);
+    PlanarScreen screen((kWidth + 7) / 8);
+    std::vector<unsigned char> pixels(canvas.memory.size());
+    GrRegion const limit = GrRect{2, 1, kWidth - 3, kHeight - 4};
+    std::unique_ptr<GrContext> const context(FindVideoMode(4, 18)->createScreenContext(limit, 5, 6));
+    canvas.SetLimit(limit);
+    canvas.SetBaseOrigin(5, 6);
+    context->FillRegion(GrRegion());
+    Judge(*context, nullptr, pixels.data(), canvas, [&] {
+        screen.Follow(pixels, kWidth);
+        for (unsigned char& pixel : canvas.memory)
+            pixel &= 15;
+    });
 }
 
 TEST(Contexts, BandsThatOverlapReachNothingOutside)

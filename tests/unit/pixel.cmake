@@ -4,4 +4,5 @@ tessella_test(NAME pixel_test LABEL unit SOURCES
     context_test.cpp
     context_state_test.cpp
     image_test.cpp
-    shapes_test.cpp)
+    shapes_test.cpp
+    LIBRARIES tessella_console_interpose)

@@ -15,10 +15,9 @@ void WriteVgaPort(unsigned word);
 enum GrVgaWord : unsigned {
     GrVgaEnableSetReset = 0x0F01,
     GrVgaReplace = 0x0003,       ///< stores replace what there is
-    GrVgaXor = 0x1803,           ///< they change the bits that are set in them
+    GrVgaXor = 0x1803,           ///< they are combined with the latches by exclusive or
     GrVgaWritePixels = 0x0005,   ///< write mode 0: a byte is 8 bits of a plane
     GrVgaWriteLatches = 0x0105,  ///< write mode 1: the planes take what the latest load found there
-    GrVgaWriteColor =
-        0x0205,              ///< write mode 2: a byte is a colour, for the pixels that the mask lets through
-    GrVgaMaskNone = 0xFF08,  ///< all 8 pixels are let through
+    GrVgaWriteColor = 0x0205,    ///< write mode 2: a byte is a colour, for the pixels that are let through
+    GrVgaMaskAll = 0xFF08,       ///< all 8 pixels are let through
 };

@@ -36,6 +36,10 @@ enum : std::uint32_t { GrRasterModeCopy = 4 };
 /// Contexts are for one thread at a time, whichever surface they draw on. Those of the screen keep clear of
 /// the library's own input threads by themselves.
 ///
+/// A VGA's screen of 16 colours can't be read back. There `GetPixel` gives black, blending is over the back
+/// colour, whatever `overDestination` says, and `ReadImage` gives nothing of use. Pixels that share a byte
+/// with one that is painted, eight side by side, may change, and inverting twice doesn't bring back what was.
+///
 /// The operations are declared in the order of their table, which is part of the library's interface.
 class GR_API GrContext {
 public:

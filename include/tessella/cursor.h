@@ -22,7 +22,8 @@ public:
     /// cursor's. Cursor and caller part here: the cursor owns image and mask. The caller deletes the cursor.
     ///
     /// With a mask, of the image's size, its set pixels are shown; the image must be in the screen's format.
-    /// With null, a true-colour image is blended by its alpha plane, which it must have.
+    /// With null, a true-colour image is blended by its alpha plane, which it must have; on a VGA's screen of
+    /// 16 colours such a cursor can't put back what it has covered.
     static GrCursor* CreateInstance(GrImage* image, GrBitmap* mask, int hotX, int hotY);
 
     GrCursor(GrCursor const&) = delete;

@@ -2,6 +2,7 @@
 
 #include <tessella/vga_l.h>
 
+#include <algorithm>
 #include <cstring>
 
 namespace {
@@ -42,7 +43,7 @@ void StoreSpan(unsigned char* row, int x, int count, std::uint8_t color, FillByt
         count -= 8 - offset;
     }
     if (count > 7) {
-        WriteVgaPort(GrVgaMaskNone);
+        WriteVgaPort(GrVgaMaskAll);
         fillBytes(byte, count / 8);
         byte += count / 8;
         count &= 7;
@@ -59,7 +60,7 @@ void PlanarSpan(unsigned char* row, int x, int count, std::uint8_t color)
     });
 }
 
-/// A block store may store to some bytes twice, which would invert them back.
+/// The exclusive or is with the latches: each byte is stored once, by itself.
 void PlanarXorSpan(unsigned char* row, int x, int count)
 {
     WriteVgaPort(GrVgaXor);
@@ -157,6 +158,9 @@ void GrSurface4::CopyRowsOut(GrRange xRange, GrRange yRange, GrImage& image, int
     if (!image.pixels) return;
     unsigned char* target = image.pixels + std::ptrdiff_t{dy} * image.width + dx;
     unsigned char const* source = RowAddress(yRange.r1) + xRange.r1;
-    for (int y = yRange.r1; y < yRange.r2; ++y, target += image.width, source += Stride())
-        PlanarRowOut(target, 0, source, xRange.r2 - xRange.r1);
+    // In modes with more memory than the usual ones, the last rows may lead beyond the window.
+    auto const* const end = GrScreen.fbMemory + GrScreen.fbLength;
+    for (int y = yRange.r1; y < yRange.r2 && source < end; ++y, target += image.width, source += Stride())
+        PlanarRowOut(target, 0, source,
+            static_cast<int>(std::min<std::ptrdiff_t>(xRange.r2 - xRange.r1, end - source)));
 }

@@ -45,6 +45,7 @@ TEST(Planar, EachOperationWritesItsWordsAndStores)
     GrImage image(9, 1, 0);
     for (int i = 0; i < 9; ++i)
         image.pixels[i] = static_cast<unsigned char>(i + 1);
+    GrImage wide(11, 2, 0);
     GrImage const grey(2, 1, nullptr, new unsigned char[2]{0, 255}, GrImageHasAlpha);
     using Operation = std::function<void(GrContext&)>;
     auto const fill = [](GrRect const& rect) { return [=](GrContext& c) { c.FillRegion(rect); }; };
@@ -94,7 +95,12 @@ TEST(Planar, EachOperationWritesItsWordsAndStores)
                 c.ReadImage({5, 2, 14, 3}, image, 0, 0);
             },
             4, nullptr, false,
-            "8008 25? 4008 26? 2008 27? 1008 28? 0808 29? 0408 30? 0208 31? 0108 32? 8008 33? "}};
+            "8008 25? 4008 26? 2008 27? 1008 28? 0808 29? 0408 30? 0208 31? 0108 32? 8008 33? "},
+        {"read to another place of the image",
+            [&](GrContext& c) {
+                c.ReadImage({5, 2, 8, 3}, wide, 2, 1);
+            },
+            4, nullptr, false, "8008 25? 4008 26? 2008 27? "}};
     context->SetForeColor(0xAAAAAA);
     for (unsigned i = 0; i < 9; ++i)
         screen.planes[25 + i] = 0x11223340u + i;
@@ -105,11 +111,12 @@ TEST(Planar, EachOperationWritesItsWordsAndStores)
         c.draw(*context);
         EXPECT_EQ(screen.Told(), "0205 " + c.told) << c.purpose;
     }
+    EXPECT_TRUE(wide.pixels[13] == 0x42 && wide.pixels[12] == 0 && wide.pixels[14] == 0);
     EXPECT_TRUE(image.pixels[0] == 0x47 && image.pixels[1] == 0x48 && image.pixels[2] == 3);
     context->GetPixel(-1, 0);
     context->DrawImageDirect({0, 0, 1, 1}, image, 2, 0);
     EXPECT_EQ(screen.Told(), "8008 0=03 ") << "no guard";
-    EXPECT_EQ(screen.planes[0], 0x1122B3C8u) << "what the mask holds back takes the latches";
+    EXPECT_EQ(screen.planes[0], 0x1122B3C2u) << "what the mask holds back takes the latches";
 }
 
 /// What the screen must show with a cursor on it, where pixels beside those of the shape take the latches.
@@ -162,7 +169,9 @@ TEST(Planar, CursorSavesThroughTheLatchesAndPutsEverythingBack)
             EXPECT_EQ(screen.Screen().bytes, WithCursor(plain, bits, x - 4, y - 3, 0xFF5757).bytes) << x;
         }
         GrScreen.context->SetForeColor(0);
+        auto const asked = screen.Count(Request::PortAccess);
         GrScreen.context->FillRegion(GrRect{0, 40, 96, 64});
+        EXPECT_EQ(screen.Count(Request::PortAccess) - asked, 2u) << "to take the cursor away, and to draw";
         GrHideCursor();
         auto const emptied = screen.Screen();
         for (unsigned i = 0; i < 96 * 64; ++i)

@@ -23,6 +23,7 @@ public:
         vga.portsAllowed = true;
         console::TrapVga(window, &model);
         GrScreen.fbMemory = window;
+        GrScreen.fbLength = console::VgaModel::kWindow;
         GrScreen.stride = bytesPerRow;
         GrScreen.ditherLine = errors.data();
         GrScreen.depth = 4;
@@ -55,7 +56,8 @@ public:
     }
 
     /// Gives each pixel that stores since the last call have let through its colour, one byte a pixel. Those
-    /// that they have held back keep theirs, which the adapter does not promise.
+    /// that they have held back keep theirs, and inverting is with the pixel, not with the latches: what the
+    /// adapter does not promise.
     void Follow(std::vector<unsigned char>& pixels, unsigned pixelsPerRow)
     {
         for (auto const& [kind, value, offset] : Events()) {

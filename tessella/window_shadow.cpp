@@ -32,6 +32,28 @@ private:
     GrContext* const before;  // not null if the window's handler has asked for paint within a pass
 };
 
+bool IsWithin(GrRegion const& region, GrRect const& rect)
+{
+    for (int i = 0; i < region.bands.item_count; ++i) {
+        auto const& band = region.bands.items[i];
+        if (band.item_count > 0 && (band.r1 < rect.y1 || band.r2 > rect.y2)) return false;
+        for (int j = 0; j < band.item_count; ++j)
+            if (band.items[j].r1 < rect.x1 || band.items[j].r2 > rect.x2) return false;
+    }
+    return true;
+}
+
+/// An image has no room for what lies beyond it, and merges of regions with gaps between their rows may give
+/// pixels that neither of them has. What is cut out of a rectangle lies in it.
+void KeepWithin(GrRegion& region, GrRect const& rect)
+{
+    if (IsWithin(region, rect)) return;
+    GrRegion missing = rect;
+    missing -= region;
+    region = rect;
+    region -= missing;
+}
+
 /// Leaves what comes behind the point, from top to bottom and from left to right.
 void DropUpTo(GrRegion& region, int x, int y)
 {
@@ -56,6 +78,7 @@ void PaintBelow(GrContextI& context, GrRect const& rect, GrRegion const& area)
         GrRegion part = rest;
         GrEvent event;
         WalkPaint(part, event, false);
+        KeepWithin(part, rect);
         GrWindow& window = *event.window;
         int const left = window.bounds.x1, top = window.bounds.y1;
         part.Offset(-left, -top);
@@ -87,13 +110,14 @@ private:
 };
 
 /// Paints the shadow in `area`, which lies in `rect`.
-void PaintShadowRect(GrRect const& wholeRect, GrRegion const& area)
+void PaintShadowRect(GrRect const& wholeRect, GrRegion area)
 {
     if (!area || !GrScreen.context) return;
     // Windows may be far larger than the screen. The corner stays: patterns are aligned with it.
     GrRect const rect{wholeRect.x1, wholeRect.y1, std::min(wholeRect.x2, Screen.bounds.x2),
         std::min(wholeRect.y2, Screen.bounds.y2)};
     if (rect.IsEmpty()) return;
+    KeepWithin(area, rect);
     GrImage image(SeenFrom(rect.x2, rect.x1), SeenFrom(rect.y2, rect.y1), 0);
     // What is made for an image is a context of images.
     std::unique_ptr<GrContextI> const context(static_cast<GrContextI*>(GrScreen.createImageContext(&image)));

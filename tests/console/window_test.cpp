@@ -1,7 +1,9 @@
+#include <common/bundle_api.h>
 #include <support/on_console.h>
 #include <support/seed.h>
 #include <support/window_judge.h>
 #include <tessella.h>
+#include <tessella/session_state.h>
 #include <tessella/window_state.h>
 
 #include <gtest/gtest.h>
@@ -66,8 +68,10 @@ public:
                 Operate();
             else if (dice < 80)
                 MoveMouse();
-            else if (dice < 99)
+            else if (dice < 98)
                 TakePaint();
+            else if (dice < 99)
+                Disturb();
             else
                 Check();
         }
@@ -239,6 +243,37 @@ private:
         pointerY = std::clamp(pointerY + accelerated(dy), 0, kHeight);
     }
 
+    /// What comes from outside of the tree: another console, another mode, another language.
+    void Disturb()
+    {
+        switch (Pick(3)) {
+        case 0:
+#ifndef __SANITIZE_THREAD__  // keeps signals back
+            screen.SwitchTo(2);
+            while (screenVisible)
+                std::this_thread::yield();
+            EXPECT_FALSE(GrWindow::GetPaintEvent(nullptr));
+            screen.SwitchTo(1);
+            while (!screenVisible)
+                std::this_thread::yield();
+            EXPECT_TRUE(GrHasEvent());
+            judge.FullInvalidate(0, true);
+#endif
+            break;
+        case 1: {
+            Sizes sizes;
+            AwaitPointer();
+            EXPECT_TRUE(GrChangeMode(sizes.width, sizes.height, sizes.depth, 0));
+            judge.valid.assign(judge.valid.size(), false);
+            pointerX = kWidth / 2, pointerY = kHeight / 2;
+            break;
+        }
+        default:
+            char const* const languages[] = {"en", "de", "ja", "xx"};
+            BundleApi::SetLanguage(languages[Pick(4)]);
+        }
+    }
+
     /// Takes one paint event, through the pump, and paints as an application does.
     bool TakePaint()
     {
@@ -308,8 +343,7 @@ private:
                 << i;
     }
 
-    /// Nothing is due for paint, so all events are the mouse's.
-    void CheckMouse()
+    void AwaitPointer()
     {
         int x = -1, y = -1;
         unsigned buttons = 0;
@@ -319,6 +353,12 @@ private:
             GrGetCursorPos(x, y, buttons);
         }
         ASSERT_EQ(std::pair(x, y), std::pair(pointerX, pointerY)) << "where the pointer stands";
+    }
+
+    /// Nothing is due for paint, so all events are the mouse's.
+    void CheckMouse()
+    {
+        AwaitPointer();
         GrEvent event;
         while (GrGetEvent(event, &noWait)) {
             bool const inside = event.x < kWidth && event.y < kHeight;

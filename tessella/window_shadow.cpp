@@ -32,11 +32,12 @@ private:
     GrContext* const before;  // not null if the window's handler has asked for paint within a pass
 };
 
+/// Empty bands count, too: cutting such a region fills the rows behind them.
 bool IsWithin(GrRegion const& region, GrRect const& rect)
 {
     for (int i = 0; i < region.bands.item_count; ++i) {
         auto const& band = region.bands.items[i];
-        if (band.item_count > 0 && (band.r1 < rect.y1 || band.r2 > rect.y2)) return false;
+        if (band.r1 < rect.y1 || band.r2 > rect.y2) return false;
         for (int j = 0; j < band.item_count; ++j)
             if (band.items[j].r1 < rect.x1 || band.items[j].r2 > rect.x2) return false;
     }

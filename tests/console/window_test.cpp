@@ -261,8 +261,12 @@ private:
 #endif
             break;
         case 1: {
+            // The pointer goes back to the middle. This is read when all motion before it has taken effect.
+            while (!screen.MoveMouse(0, 0, 0, 0))
+                std::this_thread::yield();
+            while (!screen.IsMouseRead())
+                std::this_thread::yield();
             Sizes sizes;
-            AwaitPointer();
             EXPECT_TRUE(GrChangeMode(sizes.width, sizes.height, sizes.depth, 0));
             judge.valid.assign(judge.valid.size(), false);
             pointerX = kWidth / 2, pointerY = kHeight / 2;

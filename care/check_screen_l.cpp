@@ -1,6 +1,6 @@
 #include <care/finding.h>
+#include <care/framebuffer_devices.h>
 
-#include <array>
 #include <cerrno>
 #include <cstdint>
 #include <cstring>
@@ -110,9 +110,8 @@ void CheckDevice(Findings& findings, char const* device, int fd)
 void CheckScreen(Findings& findings)
 {
     // The first that opens counts; the first is also the one to speak of if none does.
-    constexpr std::array kDevices = {"/dev/fb0", "/dev/fb/0", "/devfs/fb/0"};
     int reason = 0;
-    for (char const* const device : kDevices) {
+    for (char const* const device : kFramebufferDevices) {
         int const fd = open(device, O_RDWR | O_CLOEXEC);
         if (fd != -1) {
             CheckDevice(findings, device, fd);
@@ -121,8 +120,8 @@ void CheckScreen(Findings& findings)
         }
         if (reason == 0) reason = errno;
     }
-    findings.push_back({kPart, Severity::Unusable, CannotOpen(kDevices[0], reason),
-        MendOpening(kDevices[0], reason, kNoDevice)});
+    findings.push_back({kPart, Severity::Unusable, CannotOpen(kFramebufferDevices[0], reason),
+        MendOpening(kFramebufferDevices[0], reason, kNoDevice)});
 }
 
 }

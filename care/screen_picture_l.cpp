@@ -1,5 +1,7 @@
 #include <care/screen_picture_l.h>
 
+#include <care/framebuffer_devices.h>
+
 #include <array>
 #include <cerrno>
 #include <cstdint>
@@ -15,8 +17,6 @@
 namespace care {
 
 namespace {
-
-constexpr char const* kDevices[] = {"/dev/fb0", "/dev/fb/0", "/devfs/fb/0"};
 
 std::string Failed(char const* what) { return std::string(what) + ": " + std::strerror(errno); }
 
@@ -42,7 +42,7 @@ struct Framebuffer {
 
 std::string Framebuffer::Open()
 {
-    for (char const* const device : kDevices)
+    for (char const* const device : kFramebufferDevices)
         if (fd == -1) fd = open(device, O_RDONLY | O_CLOEXEC);
     if (fd == -1) return Failed("the framebuffer's device can't be opened");
     if (ioctl(fd, FBIOGET_FSCREENINFO, &fixed) != 0 || ioctl(fd, FBIOGET_VSCREENINFO, &variable) != 0)

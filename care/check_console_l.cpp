@@ -53,8 +53,7 @@ void CheckConsole(Findings& findings)
         findings.push_back({kPart, Severity::Limits,
             "no keyboard: " + CannotOpen("/dev/tty0", reason) + ", and this terminal is no Linux console",
             "Start the program on a console of this machine (Ctrl-Alt-F2), not over the network or in a "
-            "window; "
-            "or as root."});
+            "window; or as root."});
         return;
     }
     ConsoleState const state = ReadConsole(tty);

@@ -53,6 +53,7 @@ class User:
         self.wait_for(f"grep -qsx {word} /tmp/{word}")
 
     def start(self, program: str, how: str = "", guarded: bool = False) -> None:
+        print(f"starting {program} {how}", flush=True)
         self.type(f"{'tessella-run ' * guarded}{program} {how}\n")
         self.wait_for(HAS_TAKEN.format(state=self._state, program=program))
 
@@ -148,6 +149,8 @@ def main() -> int:
     except (Wrong, machine.MachineError, machine.MissingPart, OSError) as error:
         print(f"realconsole.consoles: {error}", file=sys.stderr)
         return 1
+    except KeyboardInterrupt:
+        return 130
     return 0
 
 

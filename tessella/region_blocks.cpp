@@ -1,14 +1,14 @@
 #include <tessella/region_blocks.h>
 
-template <typename T, int kMost>
-constinit thread_local typename SmallBlocks<T, kMost>::Block* SmallBlocks<T, kMost>::first = nullptr;
+template <typename T>
+constinit thread_local typename SmallBlocks<T>::Block* SmallBlocks<T>::first = nullptr;
 
 // None is kept before the thread is known to return them when it ends, nor afterwards.
-template <typename T, int kMost>
-constinit thread_local int SmallBlocks<T, kMost>::room = 0;
+template <typename T>
+constinit thread_local int SmallBlocks<T>::room = 0;
 
-template <typename T, int kMost>
-struct SmallBlocks<T, kMost>::Release {
+template <typename T>
+struct SmallBlocks<T>::Release {
     Release() { room = kMost; }
     ~Release()
     {
@@ -18,8 +18,8 @@ struct SmallBlocks<T, kMost>::Release {
     }
 };
 
-template <typename T, int kMost>
-T* SmallBlocks<T, kMost>::Make()
+template <typename T>
+T* SmallBlocks<T>::Make()
 {
 #ifndef __SANITIZE_ADDRESS__  // which is to see what is used after it was given back
     thread_local Release const release;
@@ -27,5 +27,5 @@ T* SmallBlocks<T, kMost>::Make()
     return new T[kGrowth];
 }
 
-template class SmallBlocks<GrRange, 256>;
-template class SmallBlocks<GrRegion::Band, 16>;
+template class SmallBlocks<GrRange>;
+template class SmallBlocks<GrRegion::Band>;

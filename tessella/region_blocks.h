@@ -8,7 +8,7 @@ constexpr int kGrowth = 10;
 /// Blocks of `kGrowth` slots that the thread has done with, for its next lists. A merge of small regions is
 /// over sooner than the heap has found it a block for each band. They are the heap's all the same: any of
 /// them may be deleted, and one that was made elsewhere may be given.
-template <typename T, int kMost>
+template <typename T>
 class SmallBlocks {
 public:
     static T* Take()
@@ -39,6 +39,8 @@ private:
     };
     struct Release;
 
+    static constexpr int kMost = 20'480 / (kGrowth * sizeof(T));  // a thread has not many complex regions
+
     static T* Make();
 
     // As little as the room that is set aside for libraries loaded late, so it can be reached without a call.
@@ -46,5 +48,8 @@ private:
     [[gnu::tls_model("initial-exec")]] static constinit thread_local int room;  // for so many more blocks
 };
 
-using RangeBlocks = SmallBlocks<GrRange, 256>;
-using BandBlocks = SmallBlocks<GrRegion::Band, 16>;
+extern template class SmallBlocks<GrRange>;
+extern template class SmallBlocks<GrRegion::Band>;
+
+using RangeBlocks = SmallBlocks<GrRange>;
+using BandBlocks = SmallBlocks<GrRegion::Band>;

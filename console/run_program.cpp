@@ -111,12 +111,13 @@ void TakeOff(int tty)
 }
 
 RunOutcome RunProgram(VirtualConsole& console, std::string const& preloaded, std::span<char*> program,
-    Script const* script, PlayMode mode)
+    Script const* script, PlayMode mode, std::function<void()> const& onStart)
 {
     SignalQueue const signals;
     SetEnvironment(console, preloaded);
     pid_t const child = Start(signals, program);
     std::optional<ScriptPlayer> player;
+    onStart();
     if (script != nullptr) player.emplace(console, *script, mode);
     int const playerFd = player ? player->SignalFd() : -1;
     bool asked = false;

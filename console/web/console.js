@@ -132,7 +132,7 @@ for (const [text, codes] of Object.entries(combinations))
 onClick(part("fit"), toggleFit);
 onClick(part("screenshot"), saveScreenshot);
 onClick(part("full"), fillDisplay);
-document.querySelector("header").addEventListener("mousedown", (event) => event.preventDefault());
+document.addEventListener("mousedown", (event) => part("asking").open || event.preventDefault());
 part("asking").addEventListener("close", () => {
     if (!rfb || document.body.dataset.state === "connected") return;
     password = part("password").value;

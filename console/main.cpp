@@ -54,6 +54,7 @@ public:
     {
         if (server) server->Start();
     }
+    std::string EndRecording(bool asked) { return server ? server->EndRecording(asked) : std::string(); }
 
 private:
     std::optional<console::ViewerServer> server;
@@ -66,6 +67,7 @@ public:
         if (options.IsWanted()) throw std::runtime_error("this tessella-console was built without viewers");
     }
     void Start() {}
+    std::string EndRecording(bool) { return {}; }
 };
 #endif
 
@@ -85,6 +87,8 @@ int Run(console::Options const& options, std::string const& preloaded, console::
     } catch (std::system_error const& error) {
         return Complain(std::string("cannot run ") + error.what(), kProgramFailed);
     }
+    if (auto const problem = viewers->EndRecording(outcome.asked); !problem.empty())
+        outcome.status = Complain(problem, outcome.status != 0 ? outcome.status : kConsoleFailed);
     viewers.reset();
     if (!outcome.scriptProblem.empty()) {
         int const failed = outcome.hasMissed ? kNotAsExpected : kConsoleFailed;

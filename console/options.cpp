@@ -27,6 +27,7 @@ at the device paths where programs look for them. No root, no device and no chan
   --vnc[=PORT]                the same for VNC viewers; port 5900 if not given
   --listen ADDRESS            let other machines reach these ports, at this address. Needs a password
   --password-file FILE        ask viewers for the password in the first line of a file; 8 characters count
+  --record FILE               write what viewers do as a script that does the same
   --fault REQUEST=ERRNO       let a call fail, always. May be repeated. REQUEST is OPEN_FB, OPEN_TTY,
                               OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
                               FBIOGET_VSCREENINFO, FBIOPUTCMAP, FBIOGETCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE,
@@ -41,7 +42,7 @@ at the device paths where programs look for them. No root, no device and no chan
 
 A script has one command a line; what follows a word that begins with # is a comment. Times are milliseconds.
 
-  move DX DY                  move the mouse, right and downward, by -127 to 127 counts
+  move DX DY...               move the mouse, right and downward, by -127 to 127 counts, once for each pair
   press BUTTON                press or release left, right or middle
   release BUTTON
   click [BUTTON]              both, left if no button is given
@@ -89,7 +90,8 @@ private:
 bool TakesValue(std::string_view name)
 {
     return name == "--mode" || name == "--pitch" || name == "--screenshot" || name == "--script" ||
-        name == "--fault" || name == "--report" || name == "--listen" || name == "--password-file";
+        name == "--fault" || name == "--report" || name == "--listen" || name == "--password-file" ||
+        name == "--record";
 }
 
 /// The value of `--web` or `--vnc`, which may be left out.
@@ -133,6 +135,9 @@ Problem Reader::ReadValue(std::string_view name, std::string_view value)
     } else if (name == "--password-file") {
         if (value.empty()) return "--password-file needs the name of a file";
         options.viewers.passwordFile = value;
+    } else if (name == "--record") {
+        if (value.empty()) return "--record needs the name of a file";
+        options.viewers.recording = value;
     } else {
         options.setup.format = ParseFormat(value);
         if (!options.setup.format) return "the report " + Quoted(value) + " isn't BITS:RED,GREEN,BLUE";
@@ -146,6 +151,7 @@ Problem Reader::Finish()
     if (!options.viewers.IsWanted()) {
         if (!options.viewers.address.empty()) return "--listen needs --web or --vnc";
         if (!options.viewers.passwordFile.empty()) return "--password-file needs --web or --vnc";
+        if (!options.viewers.recording.empty()) return "--record needs --web or --vnc";
     }
     if (options.program.empty() && !options.printSteps) return "no program is given";
     if (!pitch) return {};

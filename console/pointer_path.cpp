@@ -1,6 +1,7 @@
 #include <console/pointer_path.h>
 
 #include <algorithm>
+#include <cstdlib>
 
 namespace console {
 
@@ -34,7 +35,10 @@ std::optional<PointerPath::Motion> PointerPath::Next(int screenWidth, int screen
     x = std::clamp(x, 0, width - 1);
     y = std::clamp(y, 0, height - 1);
     if (x != atX || y != atY) {
-        Motion const step{std::clamp(x - atX, -kSlow, kSlow), std::clamp(y - atY, -kSlow, kSlow)};
+        int const dx = x - atX;
+        int const dy = y - atY;
+        int const reports = (std::max(std::abs(dx), std::abs(dy)) + kSlow - 1) / kSlow;
+        Motion const step{dx / reports, dy / reports};
         atX += step.dx;
         atY += step.dy;
         return step;

@@ -14,6 +14,7 @@ struct RunOutcome {
     /// The program's exit status, or 128 and the number of the signal that killed it; 0 if that was the
     /// script's request to end.
     int status = 0;
+    bool asked = false;  ///< the program was asked to end: by the script or by whoever runs this process
     std::string scriptProblem;  ///< why the script wasn't played to its end; see `ScriptPlayer::Stop`
     bool hasMissed = false;     ///< the reason is a screen that is not as expected
 };

@@ -43,9 +43,8 @@ bool Discard(int socket)
 
 }
 
-ViewerDoor::ViewerDoor(ViewerShare const& shared, Ports opened)
-    : share(shared), ports(std::move(opened)),
-      wakeFd(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK), "waiting for viewers")
+ViewerDoor::ViewerDoor(ViewerShare const& shared, Ports const& opened)
+    : share(shared), ports(opened), wakeFd(eventfd(0, EFD_CLOEXEC | EFD_NONBLOCK), "waiting for viewers")
 {}
 
 ViewerDoor::~ViewerDoor()
@@ -58,16 +57,6 @@ ViewerDoor::~ViewerDoor()
 void ViewerDoor::Start()
 {
     thread = std::thread([this] { Run(); });
-}
-
-std::optional<std::uint16_t> ViewerDoor::WebPort() const
-{
-    return ports.web ? std::optional(ports.web->port) : std::nullopt;
-}
-
-std::optional<std::uint16_t> ViewerDoor::VncPort() const
-{
-    return ports.vnc ? std::optional(ports.vnc->port) : std::nullopt;
 }
 
 void ViewerDoor::Run()

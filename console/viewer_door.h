@@ -23,16 +23,13 @@ public:
         std::string page;  ///< the file that browsers get
     };
 
-    /// What the viewers share must outlive the door.
-    ViewerDoor(ViewerShare const& shared, Ports opened);
+    /// Both must outlive the door.
+    ViewerDoor(ViewerShare const& shared, Ports const& opened);
     /// Hangs up on everybody.
     ~ViewerDoor();
 
     /// Begins the thread. It has the signal mask of the caller.
     void Start();
-
-    std::optional<std::uint16_t> WebPort() const;
-    std::optional<std::uint16_t> VncPort() const;
 
 private:
     using Clock = std::chrono::steady_clock;
@@ -57,7 +54,7 @@ private:
     std::string Page() const;
 
     ViewerShare const& share;
-    Ports const ports;
+    Ports const& ports;
     OwnedFd const wakeFd;
     std::atomic<bool> stopping{false};
     std::vector<Guest> guests;                     // the thread's

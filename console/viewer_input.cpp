@@ -33,10 +33,13 @@ unsigned ConsoleOfKey(unsigned code)
 
 }
 
-ViewerInput::~ViewerInput()
+void ViewerInput::Stop()
 {
+    if (!thread.joinable()) return;
     thread.request_stop();
-    if (thread.joinable()) thread.join();
+    thread.join();
+    std::lock_guard const lock(mutex);
+    NoticeReading(KeyboardState(), MouseState());
 }
 
 void ViewerInput::Start()
@@ -112,6 +115,7 @@ void ViewerInput::Run(std::stop_token const& stop)
     std::unique_lock lock(mutex);
     while (!stop.stop_requested()) {
         bool const busy = Step();
+        if (!busy && recording != nullptr) recording->OnIdle();
         if (busy)
             wake.wait_for(lock, stop, kPoll, [] { return false; });
         else
@@ -125,7 +129,8 @@ bool ViewerInput::Step()
     NoticeConsole();
     auto const keyboard = KeyboardState();
     auto const mouse = MouseState();
-    if (unsigned const late = buttons & ~wantedButtons; late != 0 && !away && mouse == Device::Free) {
+    NoticeReading(keyboard, mouse);
+    if (unsigned const late = buttons & ~wantedButtons; late != 0 && !IsAway() && mouse == Device::Free) {
         // Let go while another console was shown.
         Report({0, 0, 0, buttons & ~std::bit_floor(late)});
         return true;
@@ -142,9 +147,19 @@ bool ViewerInput::Step()
 
 void ViewerInput::NoticeConsole()
 {
-    bool const nowAway = console.Tty().activeConsole != TtyState::kOwnConsole;
-    if (away && !nowAway) path.Forget();
-    away = nowAway;
+    int const shown = console.Tty().activeConsole;
+    if (shown == shownConsole) return;
+    if (recording != nullptr) recording->Add(ConsoleSwitch{static_cast<unsigned>(shown)});
+    shownConsole = shown;
+    if (!IsAway()) path.Forget();
+}
+
+void ViewerInput::NoticeReading(Device keyboard, Device mouse)
+{
+    if (!keyRecorded && !reportRecorded) return;
+    keyRecorded = keyRecorded && keyboard != Device::Free;
+    reportRecorded = reportRecorded && mouse != Device::Free;
+    if (!keyRecorded && !reportRecorded) recording->OnRead();
 }
 
 /// True if the program has opened the mouse and said to it what it has to say.
@@ -179,7 +194,7 @@ ViewerInput::Device ViewerInput::KeyboardState()
 
 ViewerInput::Device ViewerInput::StateFor(Event const& event, Device keyboard, Device mouse) const
 {
-    if (away || std::holds_alternative<ConsoleSwitch>(event)) return Device::Free;
+    if (IsAway() || std::holds_alternative<ConsoleSwitch>(event)) return Device::Free;
     return std::holds_alternative<KeyByte>(event) ? keyboard : mouse;
 }
 
@@ -188,18 +203,23 @@ bool ViewerInput::Do(KeyByte key)
     unsigned const code = key.code & ~kReleased;
     bool const down = (key.code & kReleased) == 0;
     keysDown.set(code, down);
-    if (away) {
+    if (IsAway()) {
         unsigned const wished = down && keysDown.test(kLeftAlt) ? ConsoleOfKey(code) : 0;
         if (wished != 0) console.SwitchTo(wished);
         return true;
     }
+    if (!console.TypeKeys({&key.code, 1})) return false;
     keySent = Clock::now();
-    return console.TypeKeys({&key.code, 1});
+    if (recording != nullptr) {
+        recording->Add(key);
+        keyRecorded = true;
+    }
+    return true;
 }
 
 bool ViewerInput::Do(Place place)
 {
-    if (away) return true;
+    if (IsAway()) return true;
     auto const mode = console.Mode();
     auto const motion =
         path.Next(static_cast<int>(mode.width), static_cast<int>(mode.height), place.x, place.y);
@@ -211,13 +231,13 @@ bool ViewerInput::Do(Place place)
 bool ViewerInput::Do(Button button)
 {
     wantedButtons = button.down ? wantedButtons | button.bit : wantedButtons & ~button.bit;
-    if (!away) Report({0, 0, 0, button.down ? buttons | button.bit : buttons & ~button.bit});
+    if (!IsAway()) Report({0, 0, 0, button.down ? buttons | button.bit : buttons & ~button.bit});
     return true;
 }
 
 bool ViewerInput::Do(Notch notch)
 {
-    if (!away) Report({0, 0, notch.turn, buttons});
+    if (!IsAway()) Report({0, 0, notch.turn, buttons});
     return true;
 }
 
@@ -228,11 +248,14 @@ bool ViewerInput::Do(ConsoleSwitch to)
 }
 
 /// Only when the program has read all before, so that there is room.
-void ViewerInput::Report(MouseReport report)
+void ViewerInput::Report(MouseReport const& report)
 {
     console.MoveMouse(report.dx, report.dy, report.wheel, report.buttons);
     buttons = report.buttons;
     mouseReported = Clock::now();
+    if (recording == nullptr) return;
+    recording->Add(report);
+    reportRecorded = true;
 }
 
 }

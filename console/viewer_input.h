@@ -1,6 +1,7 @@
 #pragma once
 
 #include <console/pointer_path.h>
+#include <console/recording.h>
 #include <console/script.h>
 #include <console/virtual_console.h>
 
@@ -29,11 +30,16 @@ struct Hands {
 /// members may be called on any thread.
 class ViewerInput {
 public:
-    explicit ViewerInput(VirtualConsole& onConsole) : console(onConsole) {}
-    ~ViewerInput();
+    /// What is brought is recorded, too, unless `toRecording` is null; it must outlive this.
+    ViewerInput(VirtualConsole& onConsole, Recording* toRecording)
+        : console(onConsole), recording(toRecording)
+    {}
+    ~ViewerInput() { Stop(); }
 
     /// Begins the thread. It has the signal mask of the caller.
     void Start();
+    /// Nothing is brought any more.
+    void Stop();
 
     /// A key goes down or up, or repeats.
     void Key(Hands& hands, unsigned char code, bool down);
@@ -67,6 +73,8 @@ private:
     void Run(std::stop_token const& stop);
     bool Step();
     void NoticeConsole();
+    void NoticeReading(Device keyboard, Device mouse);
+    bool IsAway() const { return shownConsole != TtyState::kOwnConsole; }
     bool IsMouseOpen();
     Device KeyboardState();
     Device MouseState();
@@ -77,9 +85,10 @@ private:
     bool Do(Button button);
     bool Do(Notch notch);
     bool Do(ConsoleSwitch to);
-    void Report(MouseReport report);
+    void Report(MouseReport const& report);
 
     VirtualConsole& console;
+    Recording* const recording;  // the thread's, while it runs
     std::mutex mutex;
     std::condition_variable_any wake;
     std::deque<Event> events;
@@ -90,10 +99,12 @@ private:
     unsigned wantedButtons = 0;  ///< likewise
     unsigned buttons = 0;        ///< that the program has been told of
     PointerPath path;
-    bool away = false;
+    int shownConsole = TtyState::kOwnConsole;
     bool mouseReady = false;
     unsigned mouseOpens = 0;
     Clock::time_point mouseSpokenTo, mouseReported, keySent;
+    bool keyRecorded = false;     ///< and not known to be read
+    bool reportRecorded = false;  ///< likewise
 
     std::jthread thread;  // the last member, so that it ends before the others go; not under the mutex
 };

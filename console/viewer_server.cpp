@@ -50,6 +50,14 @@ std::string ReadPassword(ViewerOptions const& options)
     return password;
 }
 
+std::optional<Recording> BeginRecording(DisplayMode const& mode, std::string const& path)
+{
+    if (path.empty()) return std::nullopt;
+    auto const comment = "recorded by tessella-console --mode " + std::to_string(mode.width) + "x" +
+        std::to_string(mode.height) + "x" + std::to_string(mode.depth);
+    return std::optional<Recording>(std::in_place, path, comment);
+}
+
 ViewerDoor::Ports Open(ViewerOptions const& options, std::string page)
 {
     ViewerDoor::Ports ports;
@@ -69,12 +77,14 @@ std::string HostOf(ViewerOptions const& options)
 }
 
 ViewerServer::ViewerServer(VirtualConsole& console, ViewerOptions const& wanted, std::string page)
-    : options(wanted), watch(console), input(console), share{watch, input, {}, ReadPassword(options)},
-      door(share, Open(options, std::move(page)))
+    : options(wanted), password(ReadPassword(options)), ports(Open(options, std::move(page))), watch(console),
+      recording(BeginRecording(console.Mode(), options.recording)),
+      input(console, recording ? &*recording : nullptr), share{watch, input, {}, password}, door(share, ports)
 {}
 
 void ViewerServer::Start()
 {
+    if (recording) recording->Begin();
     {
         AllSignalsBlocked const blocked;
         watch.Start();
@@ -84,15 +94,21 @@ void ViewerServer::Start()
     Tell();
 }
 
+std::string ViewerServer::EndRecording(bool asked)
+{
+    input.Stop();
+    return recording ? recording->End(asked) : std::string();
+}
+
 void ViewerServer::Tell() const
 {
     auto const host = HostOf(options);
-    if (auto const port = door.WebPort())
-        std::fprintf(
-            stderr, "tessella-console: the screen is at http://%s:%u/\n", host.c_str(), unsigned{*port});
-    if (auto const port = door.VncPort())
-        std::fprintf(
-            stderr, "tessella-console: VNC viewers find it at %s:%u\n", host.c_str(), unsigned{*port});
+    if (ports.web)
+        std::fprintf(stderr, "tessella-console: the screen is at http://%s:%u/\n", host.c_str(),
+            unsigned{ports.web->port});
+    if (ports.vnc)
+        std::fprintf(stderr, "tessella-console: VNC viewers find it at %s:%u\n", host.c_str(),
+            unsigned{ports.vnc->port});
 }
 
 }

@@ -10,9 +10,9 @@ async function notice() {
     const { version } = JSON.parse(await textOf(`${novnc}/package.json`));
     const [cipherTerms] = (await textOf(`${novnc}/core/crypto/des.js`)).match(/\/\*.*?\*\//s);
     return `<!--
-The page of tessella-console. Its script contains noVNC ${version}, copyright the noVNC authors, under the Mozilla Public
-License 2.0, https://mozilla.org/MPL/2.0/; the sources are the package @novnc/novnc ${version} of npm. Parts of them have
-terms of their own.
+The page of tessella-console. Its script contains noVNC ${version}, copyright the noVNC authors, under the
+Mozilla Public License 2.0, https://mozilla.org/MPL/2.0/; the sources are the package @novnc/novnc ${version} of npm.
+Parts of them have terms of their own.
 
 core/crypto/des.js:
 ${cipherTerms}
@@ -33,6 +33,6 @@ const [script, style] = await Promise.all(["console.js", "console.css"].map(bund
 const terms = await notice();
 const page = (await textOf("console.html"))
     .replace('<link rel="stylesheet" href="console.css">', () => `<style>${style}</style>`)
-    .replace('<script type="module" src="console.js"></script>', () => `<script type="module">${script}</script>`)
+    .replace(' src="console.js">', () => `>${script}`)
     .replace("<html", () => `${terms}<html`);
 await writeFile(process.argv[2], page);

@@ -57,7 +57,9 @@ class Browser:
     def tell(self, method, session="", **parameters):
         self.count += 1
         message = {"id": self.count, "method": method, "params": parameters}
-        os.write(self.commands, json.dumps(message | ({"sessionId": session} if session else {})).encode() + b"\0")
+        if session:
+            message["sessionId"] = session
+        os.write(self.commands, json.dumps(message).encode() + b"\0")
         while True:
             *answers, self.received = self.received.split(b"\0")
             for answer in map(json.loads, answers):
@@ -96,8 +98,12 @@ class Page:
     def wait_for(self, state):
         eventually(f"the page is {state}", lambda: self.ask("document.body.dataset.state") == state)
 
+    def place(self, selector):
+        return self.ask(f"(({{ x, y, width, height }}) => [x, y, width, height])"
+                        f"(document.querySelector({selector!r}).getBoundingClientRect())")
+
     def mouse(self, kind, x, y, **more):
-        left, top = self.ask('(({ x, y }) => [x, y])(document.querySelector("#screen canvas").getBoundingClientRect())')
+        left, top, *_ = self.place("#screen canvas")
         self.tell("Input.dispatchMouseEvent", type=kind, x=left + x + 0.5, y=top + y + 0.5, **more)
 
     def move(self, x, y):
@@ -118,10 +124,10 @@ class Page:
 
     def click_on(self, selector):
         """On a part of the page, as the user does."""
-        x, y = self.ask(f"(({{ x, y, width, height }}) => [x + width / 2, y + height / 2])"
-                        f"(document.querySelector({selector!r}).getBoundingClientRect())")
+        left, top, width, height = self.place(selector)
+        where = {"x": left + width / 2, "y": top + height / 2}
         for kind in ("mousePressed", "mouseReleased"):
-            self.tell("Input.dispatchMouseEvent", type=kind, x=x, y=y, button="left", clickCount=1)
+            self.tell("Input.dispatchMouseEvent", type=kind, button="left", clickCount=1, **where)
 
     def type(self, *keys):
         """Keys by their places; those before a plus sign are held meanwhile."""

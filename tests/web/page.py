@@ -1,4 +1,4 @@
-"""What a user does to a program in a browser, and what both sides show. Arguments: a case below and the build folder."""
+"""What users do to a program in a browser, and what both show. Arguments: a case below, the build folder."""
 import hashlib
 import os
 import re
@@ -14,8 +14,8 @@ sys.path.append(str(Path(__file__).parents[1] / "realconsole"))
 from picture import differing_pixels, read_png  # noqa: E402
 
 BUILD = Path(sys.argv[2])
-# The camera, on the same console, takes a picture for each line that comes; their end ends the program.
-ATTENDED = 'shot=$1; shift; "$@" >events & while read -r line; do "$shot" shot.png && echo taken; done; kill $!'
+# The camera, on the same console, takes a picture for each line; the end of lines is the program's.
+ATTENDED = 'shot=$1; shift; "$@" >events & while read -r _; do "$shot" shot.png && echo taken; done; kill $!'
 
 # On the desktop: areas are told by their left, top, width and height.
 NOTE = (148, 500, 500, 120)  # what is inside, below a pointer at the title
@@ -34,8 +34,8 @@ class Console:
              "sh", "-c", ATTENDED, "sh", BUILD / "care/tessella-shot", BUILD / "examples" / program],
             cwd=self.folder.name, env=dict(os.environ, LC_ALL=language), text=True,
             stdin=subprocess.PIPE, stdout=subprocess.PIPE, stderr=subprocess.PIPE)
-        self.address = re.search(r"http://localhost:(\d+)/", self.tool.stderr.readline())
-        self.port = int(self.address[1])
+        told = self.tool.stderr.readline()
+        self.address, self.port = re.search(r"(http://localhost:(\d+)/)", told).groups()
 
     def __enter__(self):
         return self
@@ -91,7 +91,7 @@ def has_note(picture, note, by_x, by_y):
 
 def desktop(browser):
     with Console("desktop") as console:
-        page = Page(browser, console.address[0])
+        page = Page(browser, console.address)
         begin = console.shown_on(page, "the desktop", lambda now: colours(now) > 1000)
         note, picture = part(begin, NOTE), part(begin, PICTURE)
 
@@ -116,7 +116,7 @@ def desktop(browser):
         assert read_png(saved[0]) == again
 
         # Somebody else drags, and goes.
-        other = Page(browser, console.address[0])
+        other = Page(browser, console.address)
         other.wait_for("connected")
         other.press(*DRAGGED_TITLE)
         other.drag(*NOTE_TITLE)
@@ -134,11 +134,11 @@ def desktop(browser):
 def keys(browser):
     """Of a German keyboard, whatever the browser makes of them."""
     with Console("keys", language="de") as console:
-        page = Page(browser, console.address[0])
+        page = Page(browser, console.address)
         page.wait_for("connected")
         console.shown_on(page, "the keyboard", lambda now: colours(now) > 100)
-        page.type("KeyY", "Equal", "KeyE", "ShiftLeft+Equal", "KeyA", "Backquote", "KeyO", "Semicolon", "AltRight+KeyQ",
-                  "BracketLeft", "IntlBackslash")
+        page.type("KeyY", "Equal", "KeyE", "ShiftLeft+Equal", "KeyA", "Backquote", "KeyO", "Semicolon",
+                  "AltRight+KeyQ", "BracketLeft", "IntlBackslash")
         # What waits for its letter is a null character.
         expected = ["z", "\0", "é", "", "\0", "à", "\0", "ô", "ö", "", "@", "ü", "<"]
         eventually("the characters", lambda: len(console.typed()) >= len(expected))
@@ -155,12 +155,12 @@ def visits(browser):
     with tempfile.NamedTemporaryFile("w") as secret:
         print("sesam", file=secret, flush=True)
         with Console("keys", "--password-file", secret.name) as console:
-            page = Page(browser, console.address[0])
-            for password, state in (("simsalabim", "waiting"), ("sesam", "connected")):
+            page = Page(browser, console.address)
+            for password in ("simsalabim", "sesam"):
                 eventually("the question", lambda: page.ask('document.getElementById("asking").open'))
                 page.tell("Input.insertText", text=password)
                 page.tell("Input.dispatchKeyEvent", type="char", text="\r")
-                page.wait_for(state)
+            page.wait_for("connected")
     page.wait_for("ended")
     with Console("desktop", port=console.port) as console:
         console.shown_on(page, "the next program", lambda now: colours(now) > 1000)

@@ -11,7 +11,7 @@ async function notice() {
     const [cipherTerms] = (await textOf(`${novnc}/core/crypto/des.js`)).match(/\/\*.*?\*\//s);
     return `<!--
 The page of tessella-console. Its script contains noVNC ${version}, copyright the noVNC authors, under the
-Mozilla Public License 2.0, https://mozilla.org/MPL/2.0/; the sources are the package @novnc/novnc ${version} of npm.
+Mozilla Public License 2.0, https://mozilla.org/MPL/2.0/; the sources are the package @novnc/novnc of npm.
 Parts of them have terms of their own.
 
 core/crypto/des.js:

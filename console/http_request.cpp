@@ -71,7 +71,8 @@ std::string_view NameOf(std::string_view host)
 bool IsLocal(std::string_view host)
 {
     auto const name = NameOf(host);
-    return EqualsIgnoringCase(name, "localhost") || name == "127.0.0.1" || name == "[::1]";
+    return EqualsIgnoringCase(name, "localhost") || name == "[::1]" ||
+        (name.starts_with("127.") && name.find_first_not_of(".0123456789") == std::string_view::npos);
 }
 
 bool MayUpgrade(Header const& header, bool localOnly)

@@ -29,10 +29,11 @@ bool IsRelease(StepAction const& action, std::string const& line)
 }
 
 Recording::Recording(std::string const& path, std::string const& comment)
-    : name(path), file(open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666), path.c_str())
+    : name(path), file(open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0666),
+                      ("cannot write " + path).c_str())
 {
     Write("# " + comment);
-    if (error != 0) throw std::system_error(error, std::generic_category(), path);
+    if (error != 0) throw std::system_error(error, std::generic_category(), "cannot write " + path);
 }
 
 void Recording::Add(StepAction const& action)

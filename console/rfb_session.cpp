@@ -204,6 +204,7 @@ void RfbSession::TakeMessages()
 void RfbSession::AnnounceKeyCodes()
 {
     wantsKeyCodes = false;
+    client->enableSupportedMessages = FALSE;  // a list of the library's, which would take it back
     std::array<unsigned char, 16> update = {0, 0, 0, 1};
     std::uint32_t const encoding = Swap32IfLE(static_cast<std::uint32_t>(kKeyCodesEncoding));
     std::memcpy(&update[12], &encoding, sizeof encoding);

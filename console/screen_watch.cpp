@@ -54,15 +54,13 @@ void ScreenWatch::Run(std::stop_token const& stop)
 {
     std::unique_lock lock(mutex);
     while (wake.wait(lock, stop, [this] { return !followers.empty(); })) {
-        if (Look())
-            for (int const follower : followers)
-                eventfd_write(follower, 1);
+        Look();
         wake.wait_for(lock, stop, kInterval, [] { return false; });
     }
 }
 
-/// True if the screen has changed. Under the mutex. Rows that are as before cost no more than a comparison.
-bool ScreenWatch::Look()
+/// Under the mutex. Rows that are as before cost no more than a comparison.
+void ScreenWatch::Look()
 {
     auto const shown = console.Memory();
     bool const isOther = shown.mode != mode || shown.colours != colours || memory.empty();
@@ -82,7 +80,9 @@ bool ScreenWatch::Look()
         ShowRow(mode, colours, {known, pitch}, frame.Row(y));
         changed = true;
     }
-    return changed;
+    if (!changed) return;
+    for (int const follower : followers)
+        eventfd_write(follower, 1);
 }
 
 }

@@ -45,7 +45,7 @@ public:
 
 private:
     void Run(std::stop_token const& stop);
-    bool Look();
+    void Look();
 
     VirtualConsole& console;
     std::mutex mutex;  // of all below

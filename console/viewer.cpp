@@ -65,7 +65,7 @@ void Viewer::Serve()
     RfbSession session(share, socket.Get(), greeting);
     auto const greetingEnd = Clock::now() + kGreetingLimit;
     while (!stopping && session.IsOpen()) {
-        bool const greeted = session.HasGreeted();
+        greeted = session.HasGreeted();
         if (!greeted && Clock::now() > greetingEnd) return;
         std::array<pollfd, 2> events = {pollfd{session.Fd(), POLLIN, 0}, pollfd{wakeFd.Get(), POLLIN, 0}};
         poll(events.data(), events.size(), greeted ? -1 : kSecond);

@@ -21,6 +21,7 @@ public:
     Viewer& operator=(Viewer const&) = delete;
 
     bool HasEnded() const { return ended; }
+    bool HasGreeted() const { return greeted; }
 
 private:
     void Run(int endedFd);
@@ -31,6 +32,7 @@ private:
     RfbGreeting const greeting;
     OwnedFd const wakeFd;
     std::atomic<bool> ended{false};
+    std::atomic<bool> greeted{false};
     std::atomic<bool> stopping{false};
     std::thread thread;
 };

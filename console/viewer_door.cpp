@@ -65,9 +65,7 @@ void ViewerDoor::Run()
         std::array<pollfd, 3> events = {pollfd{wakeFd.Get(), POLLIN, 0},
             pollfd{ports.web ? ports.web->socket.Get() : -1, POLLIN, 0},
             pollfd{ports.vnc ? ports.vnc->socket.Get() : -1, POLLIN, 0}};
-        // At full house, those who knock wait outside.
-        auto const count = guests.size() < kMostGuests ? events.size() : 1;
-        poll(events.data(), count, guests.empty() ? -1 : kAttendInterval);
+        poll(events.data(), events.size(), guests.empty() ? -1 : kAttendInterval);
         eventfd_t ends = 0;
         eventfd_read(wakeFd.Get(), &ends);
         std::erase_if(viewers, [](auto const& viewer) { return viewer->HasEnded(); });
@@ -87,6 +85,8 @@ void ViewerDoor::Admit(Listener const& listener, bool fromWeb)
     SetOption(accepted, SOL_SOCKET, SO_KEEPALIVE, 1);
     SetOption(accepted, IPPROTO_TCP, TCP_KEEPIDLE, kKeepAliveIdle);
     if (!fromWeb) send(accepted, kRfbVersion, kRfbVersionLength, MSG_NOSIGNAL);
+    // Whoever has been here for the longest has said the least.
+    if (guests.size() >= kMostGuests) guests.erase(guests.begin());
     guests.push_back(std::move(guest));
 }
 
@@ -110,7 +110,7 @@ bool ViewerDoor::ReadRequest(Guest& guest)
     switch (wish) {
     case HttpWish::More: return true;
     case HttpWish::WebSocket:
-        if (viewers.size() < kMostViewers) {
+        if (HasRoom()) {
             LetIn(guest, RfbGreeting::WebSocket);
             return false;
         }
@@ -143,8 +143,19 @@ bool ViewerDoor::ReadVersion(Guest& guest)
     auto const known = std::min(static_cast<std::size_t>(length), start.size());
     if (length == 0 || std::string_view(bytes.data(), known) != start.substr(0, known)) return false;
     if (static_cast<std::size_t>(length) < bytes.size()) return true;
-    if (viewers.size() < kMostViewers) LetIn(guest, RfbGreeting::Version);
+    if (HasRoom()) LetIn(guest, RfbGreeting::Version);
     return false;
+}
+
+/// True if there is room for one more viewer. Those who haven't even given the password make room.
+bool ViewerDoor::HasRoom()
+{
+    if (viewers.size() < kMostViewers) return true;
+    auto const idle = std::find_if(
+        viewers.begin(), viewers.end(), [](auto const& viewer) { return !viewer->HasGreeted(); });
+    if (idle == viewers.end()) return false;
+    viewers.erase(idle);
+    return true;
 }
 
 void ViewerDoor::LetIn(Guest& guest, RfbGreeting greeting)

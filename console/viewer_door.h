@@ -50,6 +50,7 @@ private:
     bool ReadRequest(Guest& guest);
     bool ReadVersion(Guest& guest);
     bool Send(Guest& guest);
+    bool HasRoom();
     void LetIn(Guest& guest, RfbGreeting greeting);
     std::string Page() const;
 

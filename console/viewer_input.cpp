@@ -10,6 +10,7 @@ using std::chrono::milliseconds;
 
 constexpr std::size_t kMostEvents = 1000;        // that wait for the program
 constexpr milliseconds kReadLimit{100};          // what is not read for so long doesn't hold up others
+constexpr milliseconds kOpenLimit{1000};         // the same for a mouse that the program gets ready
 constexpr std::chrono::microseconds kPoll{250};  // from one look at whether the program has read to the next
 constexpr milliseconds kIdlePoll{20};
 // The program is through with what it has to say to the mouse if it says no more for so long. If it hasn't
@@ -169,7 +170,7 @@ bool ViewerInput::IsMouseOpen()
     if (unsigned const opens = console.Count(Request::OpenMouse); opens != mouseOpens) {
         mouseOpens = opens;
         mouseReady = false;
-        mouseSpokenTo = now;
+        mouseOpened = mouseSpokenTo = now;
         path.Forget();
     }
     if (mouseReady) return true;
@@ -181,9 +182,11 @@ bool ViewerInput::IsMouseOpen()
 
 ViewerInput::Device ViewerInput::MouseState()
 {
-    if (!IsMouseOpen()) return Device::Stuck;
+    auto const now = Clock::now();
+    if (!IsMouseOpen())
+        return mouseOpens != 0 && now - mouseOpened < kOpenLimit ? Device::Busy : Device::Stuck;
     if (console.IsMouseRead()) return Device::Free;
-    return Clock::now() - mouseReported < kReadLimit ? Device::Busy : Device::Stuck;
+    return now - mouseReported < kReadLimit ? Device::Busy : Device::Stuck;
 }
 
 ViewerInput::Device ViewerInput::KeyboardState()

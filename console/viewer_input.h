@@ -102,7 +102,7 @@ private:
     int shownConsole = TtyState::kOwnConsole;
     bool mouseReady = false;
     unsigned mouseOpens = 0;
-    Clock::time_point mouseSpokenTo, mouseReported, keySent;
+    Clock::time_point mouseOpened, mouseSpokenTo, mouseReported, keySent;
     bool keyRecorded = false;     ///< and not known to be read
     bool reportRecorded = false;  ///< likewise
 

@@ -1,11 +1,14 @@
 #include <console/viewer_server.h>
 
+#include <array>
+#include <climits>
 #include <csignal>
 #include <cstdio>
 #include <fstream>
 #include <stdexcept>
 
 #include <pthread.h>
+#include <unistd.h>
 
 namespace console {
 
@@ -67,10 +70,14 @@ ViewerDoor::Ports Open(ViewerOptions const& options, std::string page)
     return ports;
 }
 
-/// As the user writes it: with brackets around a number that has colons.
+/// As the user writes it, who may be at another machine: with brackets around a number that has colons.
 std::string HostOf(ViewerOptions const& options)
 {
     if (options.address.empty()) return "localhost";
+    if (std::array<char, HOST_NAME_MAX + 1> name{};
+        (options.address == "0.0.0.0" || options.address == "::") &&
+        gethostname(name.data(), name.size()) == 0)
+        return name.data();
     return options.address.find(':') == std::string::npos ? options.address : "[" + options.address + "]";
 }
 

@@ -16,6 +16,8 @@ struct DisplayMode {
     unsigned height = 768;
     unsigned depth = 32;
     unsigned pitch = 4096;  ///< bytes from one row to the next
+
+    bool operator==(DisplayMode const&) const = default;
 };
 
 struct ColourField {

@@ -1,5 +1,6 @@
 #include <console/options.h>
 
+#include <limits>
 #include <string_view>
 
 namespace console {
@@ -21,6 +22,12 @@ at the device paths where programs look for them. No root, no device and no chan
                               keys, switch consoles, take screenshots, end the program; see below
   --bless                     write what the screen shows to the files that the script expects it to be like
   --print-steps               print the single steps that the script comes down to, and run nothing
+  --web[=PORT]                show the screen in web browsers and let them use mouse and keyboard, at port 6080
+                              if not given, at any free one if 0. The address is printed
+  --vnc[=PORT]                the same for VNC viewers; port 5900 if not given
+  --listen ADDRESS            let other machines reach these ports, at this address. Needs a password
+  --password-file FILE        ask viewers for the password in the first line of a file; 8 characters count
+  --record FILE               write what viewers do as a script that does the same
   --fault REQUEST=ERRNO       let a call fail, always. May be repeated. REQUEST is OPEN_FB, OPEN_TTY,
                               OPEN_MOUSE, MMAP, IOPERM, an ioctl's name (FBIOGET_FSCREENINFO,
                               FBIOGET_VSCREENINFO, FBIOPUTCMAP, FBIOGETCMAP, KDGKBMODE, KDSKBMODE, KDGETMODE,
@@ -35,7 +42,7 @@ at the device paths where programs look for them. No root, no device and no chan
 
 A script has one command a line; what follows a word that begins with # is a comment. Times are milliseconds.
 
-  move DX DY                  move the mouse, right and downward, by -127 to 127 counts
+  move DX DY...               move the mouse, right and downward, by -127 to 127 counts, once for each pair
   press BUTTON                press or release left, right or middle
   release BUTTON
   click [BUTTON]              both, left if no button is given
@@ -61,6 +68,9 @@ or the script couldn't do its part. 127 if the program couldn't be run.
 
 using Problem = std::string;
 
+constexpr unsigned kWebPort = 6080;
+constexpr unsigned kVncPort = 5900;
+
 std::string Quoted(std::string_view text) { return std::string("'").append(text).append("'"); }
 
 /// The command line on its way into options. Each reader gives an empty text or what is wrong.
@@ -70,6 +80,7 @@ public:
 
 private:
     Problem ReadValue(std::string_view name, std::string_view value);
+    Problem ReadPort(std::string_view name, std::optional<std::string_view> value);
     Problem Finish();
 
     Options options;
@@ -79,7 +90,19 @@ private:
 bool TakesValue(std::string_view name)
 {
     return name == "--mode" || name == "--pitch" || name == "--screenshot" || name == "--script" ||
-        name == "--fault" || name == "--report";
+        name == "--fault" || name == "--report" || name == "--listen" || name == "--password-file" ||
+        name == "--record";
+}
+
+/// The value of `--web` or `--vnc`, which may be left out.
+Problem Reader::ReadPort(std::string_view name, std::optional<std::string_view> value)
+{
+    bool const web = name == "--web";
+    auto const number = value ? ParseNumber(*value) : std::optional<unsigned>(web ? kWebPort : kVncPort);
+    if (!number || *number > std::numeric_limits<std::uint16_t>::max())
+        return "the port " + Quoted(*value) + " isn't a number up to 65535";
+    (web ? options.viewers.webPort : options.viewers.vncPort) = static_cast<std::uint16_t>(*number);
+    return {};
 }
 
 Problem Reader::ReadValue(std::string_view name, std::string_view value)
@@ -106,6 +129,15 @@ Problem Reader::ReadValue(std::string_view name, std::string_view value)
         if (!fault)
             return "the fault " + Quoted(value) + " isn't REQUEST=ERRNO with a known request and error";
         options.setup.faults.push_back(*fault);
+    } else if (name == "--listen") {
+        if (value.empty()) return "--listen needs an address";
+        options.viewers.address = value;
+    } else if (name == "--password-file") {
+        if (value.empty()) return "--password-file needs the name of a file";
+        options.viewers.passwordFile = value;
+    } else if (name == "--record") {
+        if (value.empty()) return "--record needs the name of a file";
+        options.viewers.recording = value;
     } else {
         options.setup.format = ParseFormat(value);
         if (!options.setup.format) return "the report " + Quoted(value) + " isn't BITS:RED,GREEN,BLUE";
@@ -116,6 +148,11 @@ Problem Reader::ReadValue(std::string_view name, std::string_view value)
 Problem Reader::Finish()
 {
     if (options.printSteps && options.script.empty()) return "--print-steps needs a script";
+    if (!options.viewers.IsWanted()) {
+        if (!options.viewers.address.empty()) return "--listen needs --web or --vnc";
+        if (!options.viewers.passwordFile.empty()) return "--password-file needs --web or --vnc";
+        if (!options.viewers.recording.empty()) return "--record needs --web or --vnc";
+    }
     if (options.program.empty() && !options.printSteps) return "no program is given";
     if (!pitch) return {};
     if (!IsPitchValid(options.setup.mode, *pitch))
@@ -147,6 +184,12 @@ std::variant<Options, Problem> Reader::Read(std::span<char*> words)
         }
         auto const equals = word.find('=');
         auto const name = word.substr(0, equals);
+        if (name == "--web" || name == "--vnc") {
+            auto const value =
+                equals == std::string_view::npos ? std::nullopt : std::optional(word.substr(equals + 1));
+            if (auto problem = ReadPort(name, value); !problem.empty()) return problem;
+            continue;
+        }
         if (!TakesValue(name)) return "unknown option " + Quoted(word);
         std::string_view value;
         if (equals != std::string_view::npos) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <console/script_player.h>
+#include <console/viewer_options.h>
 #include <console/virtual_console.h>
 
 #include <span>
@@ -15,6 +16,7 @@ struct Options {
     std::string screenshot;  ///< a file's path, empty for none
     std::string script;      ///< likewise
     PlayMode playMode = PlayMode::Compare;
+    ViewerOptions viewers;
     bool printSteps = false;     ///< of the script, and run nothing
     char const* told = nullptr;  ///< what the user wants to be told; nothing else counts then
     std::span<char*> program;    ///< with its arguments; part of the command line

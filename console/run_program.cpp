@@ -40,13 +40,17 @@ public:
     int Fd() const { return fd.Get(); }
 
     /// Hands on what another process asks of us. What the user's terminal sends, the program gets itself.
-    void ForwardTo(pid_t program) const
+    /// True if anything was asked.
+    bool ForwardTo(pid_t program) const
     {
+        bool asked = false;
         signalfd_siginfo info{};
         while (read(fd.Get(), &info, sizeof info) == static_cast<ssize_t>(sizeof info)) {
-            if (info.ssi_signo != SIGCHLD && info.ssi_code <= 0)
-                kill(program, static_cast<int>(info.ssi_signo));
+            if (info.ssi_signo == SIGCHLD) continue;
+            asked = true;
+            if (info.ssi_code <= 0) kill(program, static_cast<int>(info.ssi_signo));
         }
+        return asked;
     }
 
 private:
@@ -111,35 +115,37 @@ void TakeOff(int tty)
 }
 
 RunOutcome RunProgram(VirtualConsole& console, std::string const& preloaded, std::span<char*> program,
-    Script const* script, PlayMode mode)
+    Script const* script, PlayMode mode, std::function<void()> const& onStart)
 {
     SignalQueue const signals;
     SetEnvironment(console, preloaded);
     pid_t const child = Start(signals, program);
     std::optional<ScriptPlayer> player;
+    onStart();
     if (script != nullptr) player.emplace(console, *script, mode);
     int const playerFd = player ? player->SignalFd() : -1;
-    bool asked = false;
+    RunOutcome outcome;
+    bool scriptAsked = false;
     int status = 0;
     while (waitpid(child, &status, WNOHANG) == 0) {
         std::array<pollfd, 3> events = {pollfd{signals.Fd(), POLLIN, 0},
             pollfd{console.KeyboardFd(), POLLIN, 0}, pollfd{playerFd, POLLIN, 0}};
         poll(events.data(), events.size(), -1);
-        signals.ForwardTo(child);
+        if (signals.ForwardTo(child)) outcome.asked = true;
         TakeOff(console.KeyboardFd());
         if (int const signal = player ? player->TakeSignal() : 0; signal != 0) {
             kill(child, signal);
-            asked = true;
+            scriptAsked = true;
         }
     }
-    RunOutcome outcome;
+    outcome.asked = outcome.asked || scriptAsked;
     if (player) {
         outcome.scriptProblem = player->Stop();
         outcome.hasMissed = player->HasMissed();
     }
     if (!WIFSIGNALED(status))
         outcome.status = WEXITSTATUS(status);
-    else if (!asked || WTERMSIG(status) != SIGTERM)
+    else if (!scriptAsked || WTERMSIG(status) != SIGTERM)
         outcome.status = 128 + WTERMSIG(status);
     return outcome;
 }

@@ -118,7 +118,7 @@ std::span<Parser::Command const> Parser::Commands()
 {
     constexpr auto any = static_cast<std::size_t>(-1);
     static constexpr std::array commands = {
-        Command{"move DX DY", 2, 2, &Parser::Move},
+        Command{"move DX DY...", 2, any, &Parser::Move},
         Command{"press BUTTON", 1, 1, &Parser::Press},
         Command{"release BUTTON", 1, 1, &Parser::Release},
         Command{"click [BUTTON]", 0, 1, &Parser::Click},
@@ -152,11 +152,14 @@ Problem Parser::ReadLine(unsigned number, Words words)
 
 Problem Parser::Move(Words words)
 {
-    auto const dx = ReadNumber(words[0], -kFarthest, kFarthest);
-    auto const dy = ReadNumber(words[1], -kFarthest, kFarthest);
-    if (!dx || !dy) return "a move is two numbers from -127 to 127";
-    if (*dx == 0 && *dy == 0) return "a move of 0 0 is none";
-    Add(MouseReport{*dx, *dy, 0, buttons});
+    if (words.size() % 2 != 0) return "each move is two numbers";
+    for (; !words.empty(); words = words.subspan(2)) {
+        auto const dx = ReadNumber(words[0], -kFarthest, kFarthest);
+        auto const dy = ReadNumber(words[1], -kFarthest, kFarthest);
+        if (!dx || !dy) return "a move is two numbers from -127 to 127";
+        if (*dx == 0 && *dy == 0) return "a move of 0 0 is none";
+        Add(MouseReport{*dx, *dy, 0, buttons});
+    }
     return {};
 }
 
@@ -266,43 +269,6 @@ Problem Parser::End(Words)
     return {};
 }
 
-/// Writes steps as commands again. The buttons' commands are in what changes from one report to the next.
-class Printer {
-public:
-    std::string operator()(MouseReport const& report)
-    {
-        unsigned const changed = std::exchange(buttons, report.buttons) ^ report.buttons;
-        for (unsigned bit = 0; bit < kButtons.size(); ++bit) {
-            if ((changed >> bit & 1) != 0)
-                return ((report.buttons >> bit & 1) != 0 ? "press " : "release ") +
-                    std::string(kButtons[bit]);
-        }
-        if (report.wheel != 0) return report.wheel > 0 ? "wheel up" : "wheel down";
-        return "move " + std::to_string(report.dx) + " " + std::to_string(report.dy);
-    }
-    std::string operator()(KeyByte const& key) const
-    {
-        std::array<char, 8> text{};
-        std::snprintf(text.data(), text.size(), "keys %02x", key.code);
-        return text.data();
-    }
-    std::string operator()(Pause const& pause) const { return "wait " + std::to_string(pause.time.count()); }
-    std::string operator()(Settle const& settle) const
-    {
-        return "settle " + std::to_string(settle.quiet.count()) + " " + std::to_string(settle.limit.count());
-    }
-    std::string operator()(Screenshot const& shot) const { return "screenshot " + shot.path; }
-    std::string operator()(Expectation const& expected) const
-    {
-        return "expect " + expected.path + " " + std::to_string(expected.limit.count());
-    }
-    std::string operator()(ConsoleSwitch const& to) const { return "switch " + std::to_string(to.console); }
-    std::string operator()(Quit const&) const { return "quit"; }
-
-private:
-    unsigned buttons = 0;
-};
-
 }
 
 std::string AtLine(std::string const& name, unsigned line, std::string const& problem)
@@ -338,12 +304,53 @@ std::variant<Script, std::string> ReadScript(std::string const& path)
     return ParseScript(text, path);
 }
 
+std::string StepPrinter::Print(StepAction const& action)
+{
+    return std::visit([this](auto const& one) { return Text(one); }, action);
+}
+
+std::string StepPrinter::Text(MouseReport const& report)
+{
+    unsigned const changed = std::exchange(buttons, report.buttons) ^ report.buttons;
+    for (unsigned bit = 0; bit < kButtons.size(); ++bit) {
+        if ((changed >> bit & 1) != 0)
+            return ((report.buttons >> bit & 1) != 0 ? "press " : "release ") + std::string(kButtons[bit]);
+    }
+    if (report.wheel != 0) return report.wheel > 0 ? "wheel up" : "wheel down";
+    return "move " + std::to_string(report.dx) + " " + std::to_string(report.dy);
+}
+
+std::string StepPrinter::Text(KeyByte const& key)
+{
+    std::array<char, 8> text{};
+    std::snprintf(text.data(), text.size(), "keys %02x", key.code);
+    return text.data();
+}
+
+std::string StepPrinter::Text(Pause const& pause) { return "wait " + std::to_string(pause.time.count()); }
+
+std::string StepPrinter::Text(Settle const& settle)
+{
+    return "settle " + std::to_string(settle.quiet.count()) + " " + std::to_string(settle.limit.count());
+}
+
+std::string StepPrinter::Text(Screenshot const& shot) { return "screenshot " + shot.path; }
+
+std::string StepPrinter::Text(Expectation const& expected)
+{
+    return "expect " + expected.path + " " + std::to_string(expected.limit.count());
+}
+
+std::string StepPrinter::Text(ConsoleSwitch const& to) { return "switch " + std::to_string(to.console); }
+
+std::string StepPrinter::Text(Quit const&) { return "quit"; }
+
 std::string PrintSteps(Script const& script)
 {
     std::string text;
-    Printer printer;
+    StepPrinter printer;
     for (auto const& step : script.steps)
-        text.append(std::visit(printer, step.action)).append("\n");
+        text.append(printer.Print(step.action)).append("\n");
     return text;
 }
 

@@ -52,9 +52,12 @@ struct ConsoleSwitch {
 /// Ends the program; the last step if there is one.
 struct Quit {};
 
+using StepAction =
+    std::variant<MouseReport, KeyByte, Pause, Settle, Screenshot, Expectation, ConsoleSwitch, Quit>;
+
 struct Step {
     unsigned line = 0;  ///< of the script, from 1
-    std::variant<MouseReport, KeyByte, Pause, Settle, Screenshot, Expectation, ConsoleSwitch, Quit> action;
+    StepAction action;
 };
 
 struct Script {
@@ -71,6 +74,26 @@ std::variant<Script, std::string> ParseScript(std::string_view text, std::string
 
 /// The same for a file, named by its path; or why it cannot be read.
 std::variant<Script, std::string> ReadScript(std::string const& path);
+
+/// Writes steps as commands again, one after the other.
+class StepPrinter {
+public:
+    /// A line, without its end. A report does one thing: it moves the mouse, turns the wheel or changes a
+    /// button.
+    std::string Print(StepAction const& action);
+
+private:
+    std::string Text(MouseReport const& report);
+    static std::string Text(KeyByte const& key);
+    static std::string Text(Pause const& pause);
+    static std::string Text(Settle const& settle);
+    static std::string Text(Screenshot const& shot);
+    static std::string Text(Expectation const& expected);
+    static std::string Text(ConsoleSwitch const& to);
+    static std::string Text(Quit const& quit);
+
+    unsigned buttons = 0;  // the buttons' commands are in what changes from one report to the next
+};
 
 /// The steps as a script, one a line. `click` and `type` do not occur, nor numbers of notches or codes.
 std::string PrintSteps(Script const& script);

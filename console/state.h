@@ -50,6 +50,8 @@ struct MouseState {
 
 struct ColourMap {
     std::array<std::uint16_t, 256> red{}, green{}, blue{};
+
+    bool operator==(ColourMap const&) const = default;
 };
 
 /// The video memory is one file. A program maps it from its start; behind all that it can map lie the planes

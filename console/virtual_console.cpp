@@ -153,6 +153,12 @@ void VirtualConsole::SetMode(DisplayMode const& mode, std::optional<PixelFormat>
     if (mode.depth == 4) state->colourMap = TextColours();
 }
 
+DisplayMode VirtualConsole::Mode()
+{
+    StateLock const lock(*state);
+    return state->mode;
+}
+
 TtyState VirtualConsole::Tty()
 {
     StateLock const lock(*state);
@@ -180,16 +186,25 @@ termios VirtualConsole::Terminal() const
 
 Picture VirtualConsole::Screen()
 {
-    DisplayMode mode;
-    ColourMap colours;
+    auto const [mode, colours, bytes] = Memory();
+    return TakePicture(mode, colours, bytes);
+}
+
+ScreenMemory VirtualConsole::Memory()
+{
+    ScreenMemory memory;
     {
         StateLock const lock(*state);
-        mode = state->mode;
-        colours = state->colourMap;
+        memory.mode = state->mode;
+        memory.colours = state->colourMap;
     }
-    auto const* const memory = static_cast<unsigned char const*>(pixels.Get());
-    if (mode.depth == 4) return TakePicture(mode, colours, {memory + kVgaPlanesOffset, kVgaPlanesLength});
-    return TakePicture(mode, colours, {memory, std::size_t{mode.pitch} * mode.height});
+    auto const* const start = static_cast<unsigned char const*>(pixels.Get());
+    auto const& mode = memory.mode;
+    if (mode.depth == 4)
+        memory.bytes = {start + kVgaPlanesOffset, std::size_t{mode.width} / 8 * mode.height * 4};
+    else
+        memory.bytes = {start, std::size_t{mode.pitch} * mode.height};
+    return memory;
 }
 
 bool VirtualConsole::TypeKeys(std::span<unsigned char const> bytes)

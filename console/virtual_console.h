@@ -20,6 +20,14 @@ struct Setup {
     std::vector<Fault> faults;
 };
 
+/// What the adapter makes a picture of. The memory holds all of the mode's rows and nothing behind them; it
+/// changes while the program draws.
+struct ScreenMemory {
+    DisplayMode mode;
+    ColourMap colours;
+    std::span<unsigned char const> bytes;
+};
+
 /// A console with its devices: a framebuffer (a memory file), a tty (a pseudo-terminal) and a mouse (a socket
 /// pair). The tool makes one for the program that it starts. A test program makes one for itself:
 ///
@@ -63,6 +71,7 @@ public:
     /// accept.
     void ChangeMode(DisplayMode const& mode, std::optional<PixelFormat> const& format = {});
 
+    DisplayMode Mode();
     TtyState Tty();
     MouseState Mouse();
     ColourMap Colours();
@@ -70,6 +79,8 @@ public:
     termios Terminal() const;
     /// What the screen shows.
     Picture Screen();
+    /// The same, as it lies in this console's memory.
+    ScreenMemory Memory();
 
     /// Key bytes, as the keyboard gives them in medium raw mode: a code, with bit 7 set at its release.
     bool TypeKeys(std::span<unsigned char const> bytes);

@@ -6,6 +6,7 @@ import re
 import subprocess
 import sys
 import tempfile
+import urllib.request
 
 from tree import ROOT
 
@@ -59,6 +60,15 @@ def packaged(build, folder):
     return folder / "root" / "usr"
 
 
+def page(tool):
+    """What browsers get."""
+    with subprocess.Popen([tool, "--web=0", "--", "sleep", "60"], stderr=subprocess.PIPE, text=True) as console:
+        address = re.search(r"http\S+", console.stderr.readline())[0]
+        answer = urllib.request.build_opener(urllib.request.ProxyHandler({})).open(address).read().decode()
+        console.terminate()
+    return answer
+
+
 def check(prefix, here):
     """Builds and runs the program in an empty folder, against the tree."""
     here.mkdir()
@@ -66,6 +76,8 @@ def check(prefix, here):
         assert not (prefix / "include" / name).exists(), f"{name} is not for applications"
     for tool in (prefix / "bin").iterdir():
         assert (prefix / "share" / "man" / "man1" / f"{tool.name}.1").exists(), f"{tool.name} has no manual page"
+    served = page(prefix / "bin" / "tessella-console")
+    assert served == (prefix / "share/tessella/console.html").read_text() and "mozilla.org/MPL/2.0" in served
 
     (here / "hello.cpp").write_text(block("cpp"), encoding="utf-8")
     (here / "CMakeLists.txt").write_text(block("cmake") + CONSOLE_TEST, encoding="utf-8")

@@ -20,10 +20,11 @@ std::string Steps(std::string const& text)
 TEST(Script, CommandsComeDownToSteps)
 {
     EXPECT_EQ(
-        Steps("# nothing\r\n\n\tmove  -127 127 # far\nclick\npress middle\nclick right\nrelease middle\n"
+        Steps("# nothing\r\n\n\tmove  -127 127 3 0 # far\nclick\npress middle\nclick right\nrelease middle\n"
               "wheel up 2\nwheel down\nkeys e 8E ff\ntype ctrl-alt-f2 a\nwait 7\nsettle\nsettle 0 5\n"
               "screenshot a#.png\nexpect b\nexpect c 9\nswitch 63\nquit"),
-        "move -127 127\npress left\nrelease left\npress middle\npress right\nrelease right\nrelease middle\n"
+        "move -127 127\nmove 3 0\npress left\nrelease left\npress middle\npress right\nrelease "
+        "right\nrelease middle\n"
         "wheel up\nwheel up\nwheel down\nkeys 0e\nkeys 8e\nkeys ff\nkeys 1d\nkeys 38\nkeys 3c\nkeys bc\nkeys "
         "b8\n"
         "keys 9d\nkeys 1e\nkeys 9e\nwait 7\nsettle 200 10000\nsettle 0 5\nscreenshot a#.png\nexpect b "
@@ -35,7 +36,8 @@ TEST(Script, ProblemsNameTheirLine)
 {
     for (auto const& [text, problem] :
         std::initializer_list<std::pair<char const*, char const*>>{
-            {"\nmov 1 1", "s:2: unknown command 'mov'"}, {"move 1", "s:1: the command is 'move DX DY'"},
+            {"\nmov 1 1", "s:2: unknown command 'mov'"}, {"move 1", "s:1: the command is 'move DX DY...'"},
+            {"move 1 2 3", "s:1: each move is two numbers"},
             {"move 128 0", "s:1: a move is two numbers from -127 to 127"}, {"move 0 0", "s:1: a move of 0 0"},
             {"click\npress left\n#\nclick", "s:4: the left button is down already"},
             {"release right", "s:1: the right button is up already"},

@@ -90,10 +90,15 @@ struct RfbSession::Protocol {
     static rfbProtocolExtension& KeyCodes()
     {
         static int encodings[] = {kKeyCodesEncoding, 0};
-        static rfbProtocolExtension extension{};
-        extension.pseudoEncodings = encodings;
-        extension.enablePseudoEncoding = OnEncoding;
-        extension.handleMessage = OnMessage;
+        static rfbProtocolExtension extension = {.newClient = nullptr,
+            .init = nullptr,
+            .pseudoEncodings = encodings,
+            .enablePseudoEncoding = OnEncoding,
+            .handleMessage = OnMessage,
+            .close = nullptr,
+            .usage = nullptr,
+            .processArgument = nullptr,
+            .next = nullptr};
         return extension;
     }
 
@@ -139,7 +144,10 @@ RfbSession::RfbSession(ViewerShare const& shared, int socket, RfbGreeting greeti
         passwords[0] = const_cast<char*>(share.password.c_str());
         screen->authPasswdData = passwords;
     }
-    share.watch.Read([this](Frame const& frame) { Resize(frame); });
+    share.watch.Read([this](Frame const& frame) {
+        frameNumber = frame.number;
+        Resize(frame);
+    });
     Connect(socket, greeting);
 }
 
@@ -148,9 +156,12 @@ RfbSession::~RfbSession()
     share.input.LetGo(hands);
     if (client == nullptr) return;
     if (IsOpen()) rfbCloseClient(client);
-    rfbDisableExtension(client, &Protocol::KeyCodes());
-    std::free(client->wsctx);  // the library forgets it
-    client->wsctx = nullptr;
+    // The library forgets these.
+    while (auto* const extension = client->extensions) {
+        client->extensions = extension->next;
+        std::free(extension);
+    }
+    std::free(std::exchange(client->wsctx, nullptr));
     rfbClientConnectionGone(client);
 }
 
@@ -224,6 +235,7 @@ void RfbSession::UpdatePicture()
 /// Brings the picture up to date and marks what has changed, in blocks of rows.
 void RfbSession::TakeFrame(Frame const& frame)
 {
+    if (std::exchange(frameNumber, frame.number) == frame.number) return;
     auto const width = static_cast<std::size_t>(screen->width);
     if (frame.width != width || frame.height != static_cast<unsigned>(screen->height)) return Resize(frame);
     std::size_t left = width;

@@ -68,7 +68,8 @@ private:
 
     ViewerShare const& share;
     std::vector<std::uint32_t> pixels;
-    char* passwords[2] = {};  // a list, as the library wants it
+    std::uint64_t frameNumber = 0;  // of the frame that they show
+    char* passwords[2] = {};        // a list, as the library wants it
     std::unique_ptr<_rfbScreenInfo, ScreenDeleter> screen;
     _rfbClientRec* client = nullptr;
     bool wantsKeyCodes = false;  // and hasn't been told that it gets them

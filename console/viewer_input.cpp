@@ -8,9 +8,11 @@ namespace {
 
 using std::chrono::milliseconds;
 
-constexpr std::size_t kMostEvents = 1000;        // that wait for the program
-constexpr milliseconds kReadLimit{100};          // what is not read for so long doesn't hold up others
-constexpr milliseconds kOpenLimit{1000};         // the same for a mouse that the program gets ready
+constexpr std::size_t kMostEvents = 1000;  // that wait for the program
+constexpr milliseconds kReadLimit{100};    // what is not read for so long doesn't hold up others
+constexpr milliseconds kOpenLimit{1000};   // the same for a mouse that the program gets ready
+// Programs read the two devices side by side. A key behind a click is to come when that has had its effect.
+constexpr milliseconds kChangePause{30};
 constexpr std::chrono::microseconds kPoll{250};  // from one look at whether the program has read to the next
 constexpr milliseconds kIdlePoll{20};
 // The program is through with what it has to say to the mouse if it says no more for so long. If it hasn't
@@ -198,7 +200,10 @@ ViewerInput::Device ViewerInput::KeyboardState()
 ViewerInput::Device ViewerInput::StateFor(Event const& event, Device keyboard, Device mouse) const
 {
     if (IsAway() || std::holds_alternative<ConsoleSwitch>(event)) return Device::Free;
-    return std::holds_alternative<KeyByte>(event) ? keyboard : mouse;
+    bool const isKey = std::holds_alternative<KeyByte>(event);
+    auto const state = isKey ? keyboard : mouse;
+    bool const tooSoon = Clock::now() - (isKey ? mouseReported : keySent) < kChangePause;
+    return state == Device::Free && tooSoon ? Device::Busy : state;
 }
 
 bool ViewerInput::Do(KeyByte key)

@@ -26,8 +26,8 @@ void Release(GrItemArray<Band> const& bands)
 {
     Band const* const end = bands.items + bands.item_capacity;
     for (Band const* band = bands.items; band < end; ++band)
-        delete[] band->items;
-    delete[] bands.items;
+        DeleteSlots(band->items, band->item_capacity);
+    DeleteSlots(bands.items, bands.item_capacity);
 }
 
 }

@@ -59,7 +59,7 @@ void Prepare(Band& result, Band const& band, int peak)
     int const capacity = GrownCapacity(Capacity(result, band), peak);
     if (result.item_capacity < capacity) {
         GrRange* const larger = NewSlots(result, capacity);
-        delete[] result.items;
+        DeleteSlots(result.items, result.item_capacity);
         result.items = larger;
     }
     result.item_capacity = capacity;

@@ -219,7 +219,7 @@ private:
             Band* const place = larger + (opened < kGrowth ? written + opened : size - unread);
             MoveSlots(larger, begin, written);
             MoveSlots(place, from, unread);
-            delete[] std::exchange(begin, larger);
+            DeleteSlots(std::exchange(begin, larger), capacity);
             to = begin + written;
             from = place;
             end = place + unread;

@@ -1,7 +1,7 @@
 #pragma once
 
 #include <common/assert.h>
-#include <tessella/region.h>
+#include <tessella/region_blocks.h>
 
 #include <algorithm>
 #include <cstring>
@@ -10,9 +10,6 @@
 
 /// The whole family reports its assertions as one module.
 static constexpr char kSource[] = GR_SOURCE("tessella/region");
-
-/// Lists grow by this many slots.
-constexpr int kGrowth = 10;
 
 /// More than memory holds; counts that stay below it can be calculated with.
 constexpr int kMostSlots = 1 << 30;
@@ -72,14 +69,32 @@ inline void ZeroSlots(GrRegion::Band* slots, std::ptrdiff_t count)
 
 inline GrRange* NewSlots(GrItemArray<GrRange> const&, int count)
 {
-    return new GrRange[static_cast<std::size_t>(count)];
+    return count == kGrowth ? RangeBlocks::Take() : new GrRange[static_cast<std::size_t>(count)];
 }
 
 inline GrRegion::Band* NewSlots(GrItemArray<GrRegion::Band> const&, int count)
 {
-    auto* const slots = new GrRegion::Band[static_cast<std::size_t>(count)];
+    auto* const slots =
+        count == kGrowth ? BandBlocks::Take() : new GrRegion::Band[static_cast<std::size_t>(count)];
     ZeroSlots(slots, count);
     return slots;
+}
+
+/// Only the slots themselves, of which there are at least `capacity`.
+inline void DeleteSlots(GrRange* slots, int capacity)
+{
+    if (capacity == kGrowth)
+        RangeBlocks::Give(slots);
+    else
+        delete[] slots;
+}
+
+inline void DeleteSlots(GrRegion::Band* slots, int capacity)
+{
+    if (capacity == kGrowth)
+        BandBlocks::Give(slots);
+    else
+        delete[] slots;
 }
 
 /// The first storage of a list that has none.
@@ -99,7 +114,7 @@ void Resize(GrItemArray<T>& list, int capacity)
     if (list.item_capacity < capacity) {
         T* const larger = NewSlots(list, capacity);
         MoveSlots(larger, list.items, list.item_capacity);
-        delete[] list.items;
+        DeleteSlots(list.items, list.item_capacity);
         list.items = larger;
     }
     list.item_capacity = capacity;

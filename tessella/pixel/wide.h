@@ -29,21 +29,18 @@ struct GrWideVectors;
 template <>
 struct GrWideVectors<16> {
     using Words = std::uint32_t __attribute__((vector_size(64)));
-    using Anywhere = std::uint32_t __attribute__((vector_size(64), aligned(1), may_alias));
     using Signs = std::int32_t __attribute__((vector_size(64)));
     using Halves = std::uint16_t __attribute__((vector_size(64)));  // two a word
 };
 template <>
 struct GrWideVectors<8> {
     using Words = std::uint32_t __attribute__((vector_size(32)));
-    using Anywhere = std::uint32_t __attribute__((vector_size(32), aligned(1), may_alias));
     using Signs = std::int32_t __attribute__((vector_size(32)));
     using Halves = std::uint16_t __attribute__((vector_size(32)));
 };
 template <>
 struct GrWideVectors<4> {
     using Words = std::uint32_t __attribute__((vector_size(16)));
-    using Anywhere = std::uint32_t __attribute__((vector_size(16), aligned(1), may_alias));
     using Signs = std::int32_t __attribute__((vector_size(16)));
     using Halves = std::uint16_t __attribute__((vector_size(16)));
 };
@@ -53,7 +50,6 @@ template <int kLaneCount>
 struct GrWide : GrWideVectors<kLaneCount> {
     static constexpr int kLanes = kLaneCount;
     using typename GrWideVectors<kLaneCount>::Words;
-    using typename GrWideVectors<kLaneCount>::Anywhere;
     using typename GrWideVectors<kLaneCount>::Halves;
 
     /// Colours taken apart, so that there is room for products: red in bits 0 to 7 and blue in 16 to 23 of
@@ -67,7 +63,7 @@ struct GrWide : GrWideVectors<kLaneCount> {
         std::uint32_t words[kLanes];
         for (std::uint32_t& each : words)
             each = word;
-        return At(words);
+        return Read(words);
     }
 
     GR_INLINE static Channels Split(Words const& colors) { return {colors & 0x00FF00FF, colors >> 8 & 0xFF}; }
@@ -105,7 +101,7 @@ struct GrWide : GrWideVectors<kLaneCount> {
         if (count < kLanes) [[unlikely]]
             return LoadFirst<Part>(from, count);
         Part parts[kLanes];
-        if constexpr (sizeof(Part) == 4) return At(from);
+        if constexpr (sizeof(Part) == 4) return Read(from);
         std::memcpy(parts, from, sizeof parts);
         return Widened(parts);
     }
@@ -114,14 +110,14 @@ struct GrWide : GrWideVectors<kLaneCount> {
     {
         if constexpr (sizeof(Part) == 4) {
             if (count >= kLanes) [[likely]] {
-                At(to) = vector;
+                Write(to, vector);
                 return;
             }
         }
         if (count < kLanes) [[unlikely]]
             return StoreSome<Part>(to, FirstLanes(count), vector);
         std::uint32_t words[kLanes];
-        At(words) = vector;
+        Write(words, vector);
         Part parts[kLanes];
         for (int i = 0; i < kLanes; ++i)
             parts[i] = static_cast<Part>(words[i]);
@@ -139,7 +135,7 @@ struct GrWide : GrWideVectors<kLaneCount> {
         std::uint32_t bits[kLanes];
         for (int i = 0; i < kLanes; ++i)
             bits[i] = 1u << i;
-        return (At(bits) & Splat(lanes)) != 0;
+        return (Read(bits) & Splat(lanes)) != 0;
     }
 
     /// As many bytes as there are lanes: the first `count` from memory, the others 0.
@@ -183,7 +179,7 @@ struct GrWide : GrWideVectors<kLaneCount> {
             return _mm256_maskstore_epi32(reinterpret_cast<int*>(to), (__m256i)Named(lanes), (__m256i)vector);
 #endif
         std::uint32_t words[kLanes];
-        At(words) = vector;
+        Write(words, vector);
         for (; lanes != 0; lanes &= lanes - 1) {
             auto const lane = static_cast<unsigned>(__builtin_ctz(lanes));
             auto const part = static_cast<Part>(words[lane]);
@@ -191,11 +187,10 @@ struct GrWide : GrWideVectors<kLaneCount> {
         }
     }
 
-    /// The vector that lies at some address.
-    GR_INLINE static Anywhere& At(void* address) { return *static_cast<Anywhere*>(address); }
-    GR_INLINE static Anywhere const& At(void const* address)
+    GR_INLINE static Words Read(void const* from) { return static_cast<Anywhere const*>(from)->vector; }
+    GR_INLINE static void Write(void* to, Words const& vector)
     {
-        return *static_cast<Anywhere const*>(address);
+        static_cast<Anywhere*>(to)->vector = vector;
     }
 
     /// Where the lanes begin that contain column `next`, out of `from` to `to`. The last ones go back over
@@ -206,6 +201,9 @@ struct GrWide : GrWideVectors<kLaneCount> {
     }
 
 private:
+    /// A vector that may lie at any address, among values of any type.
+    struct [[gnu::packed, gnu::may_alias]] Anywhere { Words vector; };
+
     GR_INLINE static Words UpperProducts(Words const& a, Halves const& b)
     {
 #if defined __AVX512BW__
@@ -252,6 +250,6 @@ private:
         std::uint32_t words[kLanes];
         for (int i = 0; i < kLanes; ++i)
             words[i] = parts[i];
-        return At(words);
+        return Read(words);
     }
 };

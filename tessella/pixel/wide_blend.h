@@ -15,7 +15,7 @@ GR_INLINE void BlendWide(GrBlend const& job)
     WideSource<Format, kHasColors, kHasAlphas> source(job);
     GrBlend const& blend = source.blend;
     Words const fore = W::Splat(blend.fore), back = W::Splat(blend.back);
-    Words const lanes = W::At(kLaneNumbers);
+    Words const lanes = W::Read(kLaneNumbers);
     int const width = blend.target.width;
     unsigned char* row = blend.target.address;
     for (std::ptrdiff_t y = 0; y < blend.target.height; ++y, row += blend.target.stride)

@@ -32,7 +32,7 @@ struct GrWideFormat {
             std::uint32_t pixels[W::kLanes] = {};
             for (int i = 0; i < W::kLanes && i < count; ++i)
                 pixels[i] = Surface::ReadPixel(from, i);
-            return W::At(pixels);
+            return W::Read(pixels);
         } else {
             return W::template Load<typename Surface::Pixel>(from, count);
         }
@@ -41,7 +41,7 @@ struct GrWideFormat {
     {
         if constexpr (kBytes == 3) {
             std::uint32_t pixels[W::kLanes];
-            W::At(pixels) = words;
+            W::Write(pixels, words);
             for (int i = 0; i < W::kLanes && i < count; ++i)
                 Surface::WritePixel(to, i, pixels[i]);
         } else {
@@ -53,10 +53,10 @@ struct GrWideFormat {
     {
         if constexpr (std::is_same_v<Colors, GrColors8>) {
             std::uint32_t words[W::kLanes];
-            W::At(words) = pixels;
+            W::Write(words, pixels);
             for (std::uint32_t& word : words)
                 word = GrColors8::FromPixel(static_cast<std::uint8_t>(word));
-            return W::At(words);
+            return W::Read(words);
         } else if constexpr (std::is_same_v<Colors, GrColorsRGB> ||
             std::is_same_v<Colors, GrColorsUnturned>) {
             return pixels;

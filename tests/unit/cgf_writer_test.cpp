@@ -59,9 +59,9 @@ TEST(Glyphset, HoldsWhatTheSourcesHave)
     std::size_t at = sizeof(CGF_Header) + sizeof(CGF_FontHeader);
     for (unsigned number = 256; number-- > 0; at += set.chunkSize) {
         std::memcpy(&set, &file.at(at), sizeof(set));
-        EXPECT_EQ(set.number, number);
-        EXPECT_EQ(set.firstCode, number == 3 ? 0x346 : number << 8);
-        EXPECT_EQ(set.glyphCount, number == 3 ? 186 : 0);
+        EXPECT_EQ(+set.number, number);
+        EXPECT_EQ(+set.firstCode, number == 3 ? 0x346 : number << 8);
+        EXPECT_EQ(+set.glyphCount, number == 3 ? 186 : 0);
     }
     EXPECT_EQ(at, file.size());
 }

@@ -29,12 +29,6 @@ constexpr std::uint8_t kKeyCodesMessage = 255;
 constexpr std::size_t kKeyCodesLength = 11;  // behind the message's type
 constexpr std::chrono::milliseconds kWrongPasswordPause{500};
 
-/// All bytes at once or none: a socket's buffer is larger than what is written.
-bool WriteAll(int fd, void const* bytes, std::size_t length)
-{
-    return send(fd, bytes, length, MSG_NOSIGNAL | MSG_DONTWAIT) == static_cast<ssize_t>(length);
-}
-
 std::uint32_t ReadBig(unsigned char const* bytes, unsigned count)
 {
     std::uint32_t number = 0;
@@ -175,7 +169,7 @@ void RfbSession::Connect(int socket, RfbGreeting greeting)
     if (greeting == RfbGreeting::Version) {
         Checked(socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends), "greeting a viewer");
         standIn = OwnedFd(ends[1], "greeting a viewer");
-        WriteAll(ends[1], kRfbVersion, kRfbVersionLength);
+        Checked(static_cast<int>(write(ends[1], kRfbVersion, kRfbVersionLength)), "greeting a viewer");
     } else {
         ends[0] = Checked(fcntl(socket, F_DUPFD_CLOEXEC, 0), "greeting a viewer");
     }

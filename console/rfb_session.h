@@ -35,7 +35,7 @@ inline constexpr std::size_t kRfbVersionLength = sizeof kRfbVersion - 1;
 /// it would serve many viewers with one screen, but then they wait for each other; here each has its own.
 class RfbSession {
 public:
-    /// The socket stays the caller's, doesn't block, and must be the screen's follower already.
+    /// The socket stays the caller's, who follows the screen already. It must not block.
     RfbSession(ViewerShare const& shared, int socket, RfbGreeting greeting);
     /// Lets go of what the viewer held.
     ~RfbSession();

@@ -92,6 +92,7 @@ private:
     std::mutex mutex;
     std::condition_variable_any wake;
     std::deque<Event> events;
+    bool hasNews = false;                    ///< since the thread has looked at the events
     std::array<unsigned, 128> keyHolders{};  ///< how many viewers hold each key
     std::array<unsigned, 3> buttonHolders{};
 

@@ -128,7 +128,7 @@ struct RfbSession::Protocol {
     }
 };
 
-void RfbSession::ScreenDeleter::operator()(_rfbScreenInfo* screen) const { rfbScreenCleanup(screen); }
+void RfbSession::ScreenDeleter::operator()(_rfbScreenInfo* old) const { rfbScreenCleanup(old); }
 
 RfbSession::RfbSession(ViewerShare const& shared, int socket, RfbGreeting greeting)
     : share(shared), screen(Protocol::MakeScreen())

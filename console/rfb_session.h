@@ -56,7 +56,7 @@ public:
 private:
     struct Protocol;  // the library's callbacks
     struct ScreenDeleter {
-        void operator()(_rfbScreenInfo* screen) const;
+        void operator()(_rfbScreenInfo* old) const;
     };
 
     void Connect(int socket, RfbGreeting greeting);

@@ -9,8 +9,9 @@
 #include <string>
 #include <vector>
 
-struct _rfbClientRec;
-struct _rfbScreenInfo;
+// The library's names.
+struct _rfbClientRec;   // NOLINT(bugprone-reserved-identifier)
+struct _rfbScreenInfo;  // NOLINT(bugprone-reserved-identifier)
 
 namespace console {
 

@@ -64,7 +64,7 @@ void ViewerInput::Key(Hands& hands, unsigned char code, bool down)
     }
 }
 
-void ViewerInput::Point(Hands& hands, int x, int y, unsigned now)
+void ViewerInput::Point(Hands& hands, int x, int y, unsigned down)
 {
     std::lock_guard const lock(mutex);
     if (!events.empty() && std::holds_alternative<Place>(events.back()))
@@ -73,12 +73,12 @@ void ViewerInput::Point(Hands& hands, int x, int y, unsigned now)
         Add(Place{x, y});
     for (unsigned bit = 0; bit < buttonHolders.size(); ++bit) {
         unsigned const mask = 1U << bit;
-        bool const down = (now & mask) != 0;
-        if (down == ((hands.buttons & mask) != 0) || (down && IsFull())) continue;
+        bool const isDown = (down & mask) != 0;
+        if (isDown == ((hands.buttons & mask) != 0) || (isDown && IsFull())) continue;
         hands.buttons ^= mask;
         auto& holders = buttonHolders[bit];
-        bool const counts = down ? holders++ == 0 : --holders == 0;
-        if (counts) Add(Button{mask, down});
+        bool const counts = isDown ? holders++ == 0 : --holders == 0;
+        if (counts) Add(Button{mask, isDown});
     }
 }
 

@@ -43,8 +43,8 @@ public:
 
     /// A key goes down or up, or repeats.
     void Key(Hands& hands, unsigned char code, bool down);
-    /// The pointer goes to a pixel; there, buttons change.
-    void Point(Hands& hands, int x, int y, unsigned buttons);
+    /// The pointer goes to a pixel; there, buttons change to those that are down.
+    void Point(Hands& hands, int x, int y, unsigned down);
     /// By one notch, 1 away from the user and -1 towards them.
     void TurnWheel(int notch);
     void SwitchTo(unsigned toConsole);

@@ -49,7 +49,7 @@ public:
     {
         std::filesystem::create_directories(folder);
         auto const command =
-            "cd " + folder + "; exec " CONSOLE_TOOL " --web=0 --vnc=0 " + words + " >out 2>err";
+            "cd " + folder + "; exec " CONSOLE_TOOL " --web=0 --vnc=0 --mode " + words + " >out 2>err";
         tool = fork();
         if (tool == 0) _exit(execl("/bin/sh", "sh", "-c", command.c_str(), nullptr));
         EXPECT_TRUE(Await([&] { return Contents(folder + "err").find("VNC") != std::string::npos; }))
@@ -175,11 +175,11 @@ private:
 
 TEST(Viewers, SeeTheVeryPixels)
 {
+    auto const script = testing::TempDir() + "viewer-script" + std::to_string(getpid());
+    std::ofstream(script) << "settle 300\nscreenshot shown.png\n";
     // Lossless, though this viewer would take lossy pictures.
-    for (std::string const mode : {"640x480x4", "803x601x8", "640x480x16", "642x480x24"}) {
-        auto const script = testing::TempDir() + "viewer-script" + std::to_string(getpid());
-        std::ofstream(script) << "settle 300\nscreenshot shown.png\n";
-        Shown shown("--mode " + mode + " --script " + script + " -- " DESKTOP);
+    for (char const* const mode : {"640x480x4", "803x601x8", "640x480x16", "642x480x24"}) {
+        Shown shown(std::string(mode).append(" --script ").append(script).append(" -- " DESKTOP));
         User first(shown.vnc), second(shown.vnc);
         ASSERT_TRUE(first.IsIn() && second.IsIn());
         auto const path = shown.folder + "shown.png";
@@ -190,8 +190,8 @@ TEST(Viewers, SeeTheVeryPixels)
             return !picture.bytes.empty();
         }));
         EXPECT_TRUE(first.Sees(picture) && second.Sees(picture)) << mode;
-        unlink(script.c_str());
     }
+    unlink(script.c_str());
 }
 
 TEST(Viewers, FollowAChangeOfMode)
@@ -215,7 +215,7 @@ TEST(Viewers, FollowAChangeOfMode)
 
 TEST(Viewers, UseMouseAndKeyboard)
 {
-    Shown shown("--mode 64x480x8 -- " INPUT_PROBE);
+    Shown shown("64x480x8 -- " INPUT_PROBE);
     User user(shown.vnc), other(shown.vnc);
     ASSERT_TRUE(user.IsIn() && other.IsIn() && shown.Prints("answers"));
     user.Point(12, 3, 1);
@@ -267,7 +267,7 @@ TEST(Viewers, UseMouseAndKeyboard)
 
 TEST(Viewers, RecordingShowsTheSameAgain)
 {
-    Shown shown("--mode 640x480x16 --record a.script --screenshot live.png -- " DESKTOP);
+    Shown shown("640x480x16 --record a.script --screenshot live.png -- " DESKTOP);
     User user(shown.vnc);
     ASSERT_TRUE(user.IsIn());
     user.Point(180, 50);
@@ -295,7 +295,7 @@ TEST(Viewers, RecordingShowsTheSameAgain)
 
 TEST(Viewers, NobodyHoldsUpOrHarmsTheOthers)
 {
-    Shown shown("--mode 64x480x8 -- " INPUT_PROBE);
+    Shown shown("64x480x8 -- " INPUT_PROBE);
     std::mt19937 random(5);
     std::vector<std::unique_ptr<Stranger>> silent;
     std::string const upgrade =
@@ -338,7 +338,7 @@ TEST(Viewers, PasswordIsAskedForAndRequiredBeyondThisMachine)
 {
     auto const file = testing::TempDir() + "viewer-password" + std::to_string(getpid());
     std::ofstream(file) << "secret\nnot this\n";
-    Shown shown("--listen 0.0.0.0 --password-file " + file + " -- " INPUT_PROBE);
+    Shown shown("64x480x8 --listen 0.0.0.0 --password-file " + file + " -- " INPUT_PROBE);
     EXPECT_FALSE(User(shown.vnc, "wrong").IsIn());
     EXPECT_TRUE(User(shown.vnc, "secret").IsIn());
     auto const fails = [&](std::string const& words, std::string const& what) {

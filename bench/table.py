@@ -217,3 +217,5 @@ try:
     main()
 except subprocess.CalledProcessError as error:
     sys.exit(f"bench: {error.cmd[0]} failed with status {error.returncode}")
+except KeyboardInterrupt:
+    sys.exit(130)

@@ -52,9 +52,8 @@ void CheckConsole(Findings& findings)
         int const reason = errno;
         findings.push_back({kPart, Severity::Limits,
             "no keyboard: " + CannotOpen("/dev/tty0", reason) + ", and this terminal is no Linux console",
-            MendOpening("/dev/tty0", reason,
-                "Start the program on a console of this machine (Ctrl-Alt-F2), not over the network or in a "
-                "window.")});
+            "Start the program on a console of this machine (Ctrl-Alt-F2), not over the network or in a "
+            "window; or as root."});
         return;
     }
     ConsoleState const state = ReadConsole(tty);

@@ -16,7 +16,7 @@ namespace {
 
 constexpr char kHelp[] =
     R"(Usage: tessella-run [--] PROGRAM [ARGUMENT]...
-       tessella-run --restore [--tty DEVICE]
+  or:  tessella-run --restore [--tty DEVICE]
 
 Runs a program, and when it has ended, however it did, puts the console back as it was before: keyboard
 mode, locks and lights, terminal settings, text or graphics, switching between consoles, and the console that

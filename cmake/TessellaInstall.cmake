@@ -2,6 +2,9 @@
 # Three parts, which packages are made of: `runtime`, `development` and `tools`.
 include(CMakePackageConfigHelpers)
 
+# The list that an installation leaves here may be root's, and the next installation somebody else's.
+install(CODE "file(REMOVE \"${PROJECT_BINARY_DIR}/install_manifest.txt\")")
+
 set(TESSELLA_PACKAGE_DIR ${CMAKE_INSTALL_LIBDIR}/cmake/tessella)
 
 install(TARGETS tessella EXPORT tessellaTargets

@@ -1,6 +1,3 @@
-// compile_glyphset: makes the file glyphset.cgf, the library's own font, of the fonts that it is put together
-// from.
-
 #include <tools/cgf_compose.h>
 #include <tools/cgf_writer.h>
 
@@ -11,6 +8,14 @@
 #include <string_view>
 
 namespace {
+
+constexpr char kHelp[] = R"(Usage: compile_glyphset OUTPUT BITMAPS OUTLINES CELLS OFFSETS
+       compile_glyphset --help | --version
+
+Makes the file glyphset.cgf, the library's own font, of the fonts that it is put together from.
+
+The exit status is 0, 1 if a file cannot be read or written, 2 for wrong usage.
+)";
 
 constexpr std::u16string_view kFace = u"Helvetica";
 
@@ -39,8 +44,12 @@ void Write(char const* path, std::string const& bytes)
 
 int main(int count, char** words)
 {
+    std::string_view const word = count > 1 ? words[1] : "";
+    if (word == "--help" || word == "--version")
+        return std::fputs(word == "--help" ? kHelp : "compile_glyphset " TESSELLA_VERSION "\n", stdout), 0;
     if (count != 6) {
-        std::fputs("usage: compile_glyphset OUTPUT BITMAPS OUTLINES CELLS OFFSETS\n", stderr);
+        std::fputs(
+            "compile_glyphset: an output and four sources must be given (--help tells more)\n", stderr);
         return 2;
     }
     try {

@@ -1,6 +1,3 @@
-// pack_archive OUTPUT NAME=FILE...: makes the archive of resource files. What it writes depends on the
-// names and the files' contents alone, so that the same sources make the same bytes anywhere at any time.
-
 #include <cstdio>
 #include <filesystem>
 #include <map>
@@ -17,6 +14,15 @@ constexpr zip_uint16_t kFirstDay = 1 << 5 | 1;  // 1 January 1980, with which th
 constexpr zip_uint32_t kFileMode = 0100644U << 16;
 constexpr zip_uint32_t kFolderMode = 040755U << 16 | 0x10;  // the last bit is the format's own
 constexpr zip_uint32_t kBestDeflate = 9;
+
+constexpr char kHelp[] = R"(Usage: pack_archive OUTPUT NAME=FILE...
+       pack_archive --help | --version
+
+Makes the archive of resource files. What it writes depends on the names and the files' contents alone, so
+that the same sources make the same bytes anywhere at any time.
+
+The exit status is 0, 1 if a file cannot be read or written, 2 for wrong usage.
+)";
 
 struct Discard {
     void operator()(zip_t* zip) const { zip_discard(zip); }
@@ -94,8 +100,11 @@ private:
 
 int main(int argc, char** argv)
 {
-    if (argc < 3) {
-        std::fputs("usage: pack_archive OUTPUT NAME=FILE...\n", stderr);
+    std::string_view const word = argc > 1 ? argv[1] : "";
+    if (word == "--help" || word == "--version")
+        return std::fputs(word == "--help" ? kHelp : "pack_archive " TESSELLA_VERSION "\n", stdout), 0;
+    if (argc < 3 || word.starts_with('-')) {
+        std::fputs("pack_archive: an output and files must be given (--help tells more)\n", stderr);
         return 2;
     }
     try {

@@ -19,9 +19,9 @@ constexpr int kFailed = 1;
 constexpr int kWrongUsage = 2;
 
 constexpr char kHelp[] = R"(Usage: tessella-cgf list FILE
-       tessella-cgf check FILE
-       tessella-cgf render [OPTION]... FILE PICTURE.png
-       tessella-cgf --help | --version
+  or:  tessella-cgf check FILE
+  or:  tessella-cgf render [OPTION]... FILE PICTURE.png
+  or:  tessella-cgf --help | --version
 
 Tells about a file of bitmap glyphs, as the library's built-in font glyphset.cgf is one.
 

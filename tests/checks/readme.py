@@ -27,6 +27,13 @@ def block(language, containing=""):
     return found[0]
 
 
+def compare(picture, colours):
+    """The colours of a picture at the points."""
+    screen = read_png(picture)
+    found = [screen.at(y * screen.width + x) for x, y in POINTS]
+    assert found == colours, f"{picture}: {found} instead of {colours}"
+
+
 def run(*command, **options):
     print("+", *command, flush=True)
     subprocess.run(command, check=True, **options)
@@ -38,12 +45,16 @@ def installed(build, folder):
     return folder / "installed"
 
 
-def packaged(build, folder):
-    """A tree as the packages have it."""
+def make_packages(build, folder):
     run("cpack", "--config", build / "CPackConfig.cmake", "-B", folder / "packages", cwd=build, stdout=subprocess.DEVNULL)
     packages = sorted((folder / "packages").glob("*.deb"))
     assert [one.name.split("_")[0] for one in packages] == ["libtessella-dev", "libtessella1", "tessella-tools"]
-    for package in packages:
+    return packages
+
+
+def packaged(build, folder):
+    """A tree as the packages have it."""
+    for package in make_packages(build, folder):
         run("dpkg-deb", "--extract", package, folder / "root")
     return folder / "root" / "usr"
 
@@ -73,13 +84,12 @@ def check(prefix, here):
         (here / "script").write_text("settle\nscreenshot shown.png\nkeys 1c\n", encoding="utf-8")
         run(prefix / "bin" / "tessella-console", "--mode", "640x480x32", "--screenshot", "left.png",
             "--script", "script", "--", program, cwd=here, env=dict(os.environ, **extra))
-        for picture, colours in (("shown.png", PICTURE), ("left.png", CLEARED)):
-            screen = read_png(here / picture)
-            found = [screen.at(y * screen.width + x) for x, y in POINTS]
-            assert found == colours, f"{found} instead of {colours}"
+        compare(here / "shown.png", PICTURE)
+        compare(here / "left.png", CLEARED)
 
 
-with tempfile.TemporaryDirectory() as temporary:
-    base = pathlib.Path(temporary)
-    for tree in (installed, packaged):
-        check(tree(pathlib.Path(sys.argv[1]), base), base / f"hello_{tree.__name__}")
+if __name__ == "__main__":
+    with tempfile.TemporaryDirectory() as temporary:
+        base = pathlib.Path(temporary)
+        for tree in (installed, packaged):
+            check(tree(pathlib.Path(sys.argv[1]), base), base / f"hello_{tree.__name__}")

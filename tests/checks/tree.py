@@ -50,5 +50,10 @@ def run_each(jobs):
             job.stamp.touch()
         return None
 
+    complaints = []
     with concurrent.futures.ThreadPoolExecutor(len(os.sched_getaffinity(0))) as pool:
-        return [complaint for complaint in pool.map(run, jobs) if complaint]
+        for done, complaint in enumerate(pool.map(run, jobs), 1):
+            if sys.stderr.isatty():
+                print(f"\r{done} of {len(jobs)}", end="" if done < len(jobs) else "\n", file=sys.stderr, flush=True)
+            complaints += [complaint] if complaint else []
+    return complaints

@@ -69,8 +69,7 @@ TEST(Guardian, SaysWhatItCannotDo)
         int status;
     } const cases[] = {{"", "no program is given", 2}, {"--any", "unknown option '--any'", 2},
         {"--tty", "needs a device", 2}, {"--restore true", "runs no program", 2},
-        {"--tty /dev/tty0 true", "for --restore", 2}, {"--help", "Usage: ", 0},
-        {"--version", "tessella-run 1", 0}, {"./none", "cannot run ./none: No such file", 127},
+        {"--tty /dev/tty0 true", "for --restore", 2}, {"./none", "cannot run ./none: No such file", 127},
         {"--restore --tty /dev/null", "/dev/null: Inappropriate ioctl", 1}};
     for (auto const& [words, text, status] : cases) {
         auto const outcome = OnConsole(TESSELLA_RUN " " + std::string(words));
@@ -93,12 +92,21 @@ TEST(Shot, ShowsWhatTheScreenShows)
             "");
 }
 
+/// A shell's commands that put a library in front of the real one whose archive has been through some of
+/// Python's: there it is the bytes `zip`, and `of` tells where the data of a file begin.
+std::string WithArchive(std::string const& edit)
+{
+    return "d=$(mktemp -d); trap 'rm -r $d' EXIT; export LD_LIBRARY_PATH=$d; " OBJCOPY
+           " --dump-section .zip=$d/zip " LIBRARY " $d/libtessella.so.1; "
+           "python3 -c 'import sys, zipfile; path = sys.argv[1]; zip = bytearray(open(path, \"rb\").read()); "
+           "of = lambda name: zipfile.ZipFile(path).getinfo(name).header_offset + 30 + len(name); " +
+        edit +
+        "; open(path, \"wb\").write(zip)' $d/zip; " OBJCOPY " --update-section .zip=$d/zip " LIBRARY
+        " $d/libtessella.so.1; ";
+}
+
 TEST(Doctor, NamesEveryFaultAndWhatHelps)
 {
-    std::string const folder = testing::TempDir() + "doctor";
-    std::string const withoutArchive = "mkdir -p " + folder +
-        "; " OBJCOPY " --remove-section .zip " LIBRARY " " + folder +
-        "/libtessella.so.1; export LD_LIBRARY_PATH=" + folder + "; ";
     struct {
         int status;
         std::string options, before, text, mend;
@@ -118,7 +126,20 @@ TEST(Doctor, NamesEveryFaultAndWhatHelps)
         {2, "", Taking("sleep 9") + " & until " CONSOLE_STATE " | grep -q 'screen 1'; do :; done; ",
             "another program draws", "tessella-run --restore"},
         {1, "--fault OPEN_MOUSE=ENOENT", "", "/dev/input/mice can't be opened", "modprobe mousedev"},
-        {2, "", withoutArchive, "has no archive", "Install the library again"},
+        {2, "--mode 640x480x4 --fault IOPERM=EPERM", "", "ports of the VGA can't be used: Operation not",
+            "CAP_SYS_RAWIO"},
+        {2, "", WithArchive("zip = zip[:-9]"), "or a damaged one", ""},
+        {2, "", WithArchive("0") + OBJCOPY " --remove-section .zip $d/libtessella.so.1; ",
+            "has no archive of resources, or a damaged one", "Install the library again"},
+        {2, "", WithArchive("zip[of(\"glyphset.cgf\") + 9999] ^= 1"),
+            "resources  unusable  glyphset.cgf is missing", "without the built-in font"},
+        {1, "", WithArchive("zip = zip.replace(b\"fonts.xml\", b\"f0nts.xml\")"),
+            "resources  limits    fonts.xml is missing", "without the table of fonts"},
+        {1, "", WithArchive("zip[of(\"Nimbus_Sans.afm\") + 999] ^= 1"), "Nimbus_Sans.afm is", "a scalable"},
+        {1, "", WithArchive("zip[of(\"Nimbus_Sans_Bold.afm\") + 999] ^= 1"), "Bold.afm is", "a scalable"},
+        {1, "", WithArchive("zip[of(\"keyboard.kbd\") + 99] ^= 1"), "keyboard.kbd is", "the key layouts"},
+        {1, "", WithArchive("zip[of(\"de/keyboard.kbd\") + 99] ^= 1") + "export LC_ALL=de_DE; ",
+            "keyboard.kbd is", "the key layouts"},
     };
     for (auto const& [status, options, before, text, mend] : cases) {
         auto const outcome =
@@ -131,7 +152,6 @@ TEST(Doctor, NamesEveryFaultAndWhatHelps)
                                         "print(*(f[\"state\"] for f in json.load(sys.stdin)))'")
                   .out,
         "fine fine fine fine\n");
-    EXPECT_EQ(OnConsole(TESSELLA_DOCTOR " --any").status, 2);
 }
 
 }

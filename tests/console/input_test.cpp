@@ -364,7 +364,7 @@ TEST(Pump, AStormOfPacketsLosesOnlyWhatTheQueueCannotHold)
         });
 }
 
-TEST(Mouse, AModeChangesUnderAMovingMouse)
+TEST(Mouse, AModeChangesUnderAMovingMouseAndItsCursor)
 {
     OnConsole("64x48x32", nullptr, [](console::VirtualConsole& screen) {
         Start();
@@ -383,6 +383,10 @@ TEST(Mouse, AModeChangesUnderAMovingMouse)
             EXPECT_TRUE(GrGetEvent(event, &noWait));
             EXPECT_EQ(changed, event.rect);
             EXPECT_EQ(event.rect, (GrRect{0, 0, i % 2 == 0 ? 32 : 64, i % 2 == 0 ? 16 : 48}));
+            std::unique_ptr<GrCursor> const cursor(
+                GrCursor::CreateInstance(new GrImage(9, 9, GrImageHasAlpha), nullptr, 4, 4));
+            cursor->Activate();
+            GrScreen.context->FillRegion(event.rect);
         }
         stop = true;
         mover.join();

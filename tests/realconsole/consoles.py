@@ -1,7 +1,8 @@
 """Sits at a machine with shells on two of its consoles: goes to the other one and back while a program draws, and
-sees to it that the shell takes what is typed after each way in which a program can crash, or die under a guardian.
+sees to it that the shell takes what is typed after each way in which a program can crash, or die under a guardian. And
+asks the doctor.
 
-    consoles.py GALLERY FAULTY GUARDIAN STATE KERNEL KEEP    programs, folders of the kernel and for pictures, logs
+    consoles.py GALLERY FAULTY GUARDIAN DOCTOR STATE KERNEL KEEP    programs, folders of the kernel and for pictures, logs
 """
 
 import sys
@@ -53,6 +54,7 @@ class User:
         self.wait_for(f"grep -qsx {word} /tmp/{word}")
 
     def start(self, program: str, how: str = "", guarded: bool = False) -> None:
+        print(f"starting {program} {how}", flush=True)
         self.type(f"{'tessella-run ' * guarded}{program} {how}\n")
         self.wait_for(HAS_TAKEN.format(state=self._state, program=program))
 
@@ -63,6 +65,12 @@ class User:
             if now != shown:
                 shown, since = now, time.monotonic()
         return shown
+
+    def ask_doctor(self) -> None:
+        for before, status, words in (("", 0, "/dev/input/mice answers"), ("echo > /dev/mice; ", 2, "doesn't answer")):
+            told = self._real.run(f"{before}tessella-doctor; s=$?; rm -f /dev/mice; exit $s")
+            if told[0] != status or not any(words in line for line in told[1]):
+                raise Wrong(f"the doctor says {told}")
 
     def leave_and_return(self) -> None:
         self.start("gallery")
@@ -129,14 +137,15 @@ class User:
 
 
 def main() -> int:
-    gallery, faulty, guardian, state, kernel, keep = map(Path, sys.argv[1:])
+    gallery, faulty, guardian, doctor, state, kernel, keep = map(Path, sys.argv[1:])
     try:
-        with machine.boot(16, [gallery, faulty, guardian, state], kernel, keep) as real:
-            real.run(f"{machine.PLUG_MOUSE}; ln -s {gallery} {faulty} {guardian} /bin")
+        with machine.boot(16, [gallery, faulty, guardian, doctor, state], kernel, keep) as real:
+            real.run(f"{machine.PLUG_MOUSE}; ln -s {gallery} {faulty} {guardian} {doctor} /bin")
             for console in (1, 2):
                 real.run(SHELL.format(console))
             user = User(real, state)
             user.check_shell("ready")
+            user.ask_doctor()
             user.leave_and_return()
             for how in ("key", "paint", "mouse", "away", "frozen"):
                 user.crash(how)
@@ -148,6 +157,8 @@ def main() -> int:
     except (Wrong, machine.MachineError, machine.MissingPart, OSError) as error:
         print(f"realconsole.consoles: {error}", file=sys.stderr)
         return 1
+    except KeyboardInterrupt:
+        return 130
     return 0
 
 

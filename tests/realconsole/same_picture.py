@@ -23,16 +23,20 @@ def main() -> int:
     try:
         programs = [options.example, options.pattern, options.state, *(play[0] for play in options.play)]
         with machine.boot(options.bits, programs, options.kernel, options.keep) as real:
+            print("the kernel is up", flush=True)
             # The example first: it is to meet the screen as the kernel leaves it.
             compare_program(real, options, options.example)
             compare_program(real, options, options.pattern)
             for program, path, language in options.play:
+                print(f"playing {path.name} to {program.name}", flush=True)
                 compare_script(real, options, program, path, str(language))
     except (
         Difference, machine.MachineError, machine.MissingPart, script.ScriptError, ValueError, OSError
     ) as error:
         print(f"realconsole.{options.bits}: {error}", file=sys.stderr)
         return 1
+    except KeyboardInterrupt:
+        return 130
     return 0
 
 

@@ -106,7 +106,6 @@ TEST(CgfTool, TellsAndShows)
             {"render --set 0 --text xy --scale 2 sound p.png && cat p.png", 0, "PNG"},
             {"render --font 2 --text x sound p.png", 1, "has no font 2"},
             {"render --text x sound none/p.png", 1, "none/p.png: cannot be written: No such"},
-            {"--help", 0, "Usage: tessella-cgf list"}, {"--version", 0, "tessella-cgf 1."},
             {"", 2, "the command is missing"}, {"show sound", 2, "unknown command 'show'"},
             {"check sound sound", 2, "one word too many"}, {"list --all", 2, "option '--all'"},
             {"render sound p.png", 2, "neither --text nor"},

@@ -10,9 +10,7 @@
 
 #include <gtest/gtest.h>
 
-#include <array>
 #include <chrono>
-#include <cstring>
 #include <future>
 #include <limits>
 #include <memory>
@@ -64,33 +62,6 @@ static_assert(!std::is_base_of_v<GrContextI, GrScreenContextBase>);
 // The back colour of new contexts.
 static_assert(GrSurface8::kAllBits == 0xFF && GrSurface16::kAllBits == 0xFFFF);
 static_assert(GrSurface24::kAllBits == 0xFFFFFF && GrSurface32::kAllBits == 0xFFFFFFFF);
-
-/// The place of a virtual function in its class's table, as this platform's C++ ABI keeps it in a pointer to
-/// it.
-template <typename Pointer>
-std::size_t Slot(Pointer function)
-{
-    std::size_t word;
-    std::memcpy(&word, &function, sizeof word);
-    return (word - 1) / sizeof(void*);
-}
-
-TEST(ContextState, OperationsStandInTheOrderThatApplicationsWereBuiltWith)
-{
-    std::size_t slot = 2;  // behind the two entries of the destructor
-#define SLOT(name) Slot(&GrContextI::name)
-    for (std::size_t const actual : {SLOT(SetClipRegion), SLOT(GetClipRegion), SLOT(ExcludeClipRect),
-             SLOT(ExcludeClipRegion), SLOT(ResetClipRegion), SLOT(GetClipRect), SLOT(SetOrigin),
-             SLOT(GetOrigin), SLOT(SetBackColor), SLOT(SetForeColor), SLOT(SetPattern), SLOT(SetRasterMode),
-             SLOT(GetRasterMode), SLOT(GetPixel), SLOT(DrawPixel), SLOT(FillRegion), SLOT(FillRegionAlpha),
-             SLOT(DrawLine), SLOT(DrawArc), SLOT(FillArc), SLOT(FillPolygon), SLOT(DrawText), SLOT(DrawTextW),
-             SLOT(DrawBitmap), SLOT(DrawBitmapTransparent), SLOT(DrawImageMasked), SLOT(DrawImage),
-             SLOT(DrawImageAlpha), SLOT(ReadImage), SLOT(DrawImageMaskedDirect), SLOT(DrawImageDirect),
-             SLOT(DrawImageAlphaDirect), SLOT(ReadImageDirect), SLOT(CopyFromContext), SLOT(LoadPixels),
-             SLOT(LoadPixelsDithered), SLOT(UnloadPixels), SLOT(SetBaseOrigin), SLOT(SetLimitRegion)})
-        EXPECT_EQ(actual, slot++);
-#undef SLOT
-}
 
 TEST(ContextState, CoordinatesBeyondTheirRangeAreClippedAway)
 {
@@ -217,32 +188,6 @@ TEST(ScreenGuard, IsHeldByDrawingThatMeetsTheClip)
     }
     hideCount = 1;
     GrScreen = {};
-}
-
-TEST(VideoMode, IsFoundByBitsFirstAndColourBitsThen)
-{
-    struct Case {
-        unsigned bits, colorBits, depth, bytes;
-    };
-    for (auto const& [bits, colorBits, depth, bytes] :
-        {Case{4, 0, 4, 1}, {4, 24, 4, 1}, {8, 0, 8, 1}, {8, 24, 8, 1}, {16, 15, 15, 2}, {16, 16, 16, 2},
-            {24, 24, 24, 3}, {32, 24, 24, 4}, {24, 16, 0, 0}, {32, 30, 0, 0}, {32, 32, 0, 0}, {16, 24, 0, 0},
-            {15, 15, 0, 0}, {16, 12, 0, 0}, {1, 3, 0, 0}}) {
-        auto const* const mode = FindVideoMode(bits, colorBits);
-        EXPECT_EQ(mode ? mode->depth : 0, depth) << bits << ' ' << colorBits;
-        EXPECT_EQ(mode ? mode->bytesPerPixel : 0, bytes);
-    }
-}
-
-TEST(VideoMode, ColourMapHoldsTheCubeWithRedFastest)
-{
-    GrColorMap const map = MakeColorMap();
-    using Entry = std::array<int, 3>;
-    auto const entry = [&](unsigned i) { return Entry{map.red[i], map.green[i], map.blue[i]}; };
-    EXPECT_EQ(entry(0), (Entry{0, 0, 0}));
-    EXPECT_EQ(entry(20 + 36 * 1 + 6 * 2 + 3), (Entry{153 << 8, 102 << 8, 51 << 8}));
-    EXPECT_EQ(entry(235), (Entry{255 << 8, 255 << 8, 255 << 8}));
-    EXPECT_EQ(entry(255), (Entry{63, 63, 63})) << "next to black on the 16-bit scale";
 }
 
 }

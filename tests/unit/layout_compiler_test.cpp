@@ -79,8 +79,7 @@ TEST(LayoutCompiler, WhatIsWrongIsToldWithItsLine)
         EXPECT_NE(outcome.out.find(problem), std::string::npos) << text << "\n" << outcome.out;
     }
     for (auto const& [words, status, problem] :
-        {std::tuple{"--help", 0, "Usage: compile_key_layouts"}, {"--version", 0, "compile_key_layouts 1."},
-            {"b.layout", 2, "--output is missing"}, {"--output", 2, "needs the name"},
+        {std::tuple{"b.layout", 2, "--output is missing"}, {"--output", 2, "needs the name"},
             {"--output out", 2, "no layout is given"}, {"--colour", 2, "unknown option '--colour'"},
             {"--output . b.layout", 1, ".: cannot be written: Is"},
             {"--output /dev/full b.layout", 1, "/dev/full: cannot be written: No space"}}) {

@@ -111,7 +111,6 @@ TEST(MessageCompiler, WhatIsWrongIsToldWithItsLine)
                  "a.po:97: duplicate message definition\n"},
              {"", "--output out none.po", 1, "none.po: cannot be read"},
              {"", "--output /dev/full a.po", 1, "/dev/full: cannot be written: No space"},
-             {"", "--help", 0, "Usage: compile_messages"}, {"", "--version", 0, "compile_messages 1."},
              {"", "a.po --output", 2, "needs the name"}, {"", "--output out", 2, "no translations are given"},
              {"", "a.po b.po", 2, "'b.po' is one"}, {"", "--colour", 2, "unknown option '--colour'"}}) {
         auto const command = "mkdir -p " + folder + " && cd " + folder + " && sed '" + edit +

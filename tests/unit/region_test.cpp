@@ -3,11 +3,9 @@
 #include <tessella/region_cut.h>
 #include <tessella/region_storage.h>
 
-#include <array>
 #include <gtest/gtest.h>
 #include <limits>
 #include <new>
-
 #include <thread>
 
 namespace {
@@ -61,17 +59,6 @@ TEST(Region, DamagedRangesDoNotMakeMoreThanThereIsRoomFor)
     GrRegion region = RegionOf("0..1: 0..15");
     region &= RegionOf("0..1: 0..1 20..2 4..5 20..6 8..9");
     EXPECT_LE(region.bands.items[0].item_count, region.bands.items[0].item_capacity);
-}
-
-TEST(Region, FieldsLieWhereApplicationsLookForThem)
-{
-    GrRegion::Band band{};
-    auto const offset = [&](auto const& field) {
-        return reinterpret_cast<char const*>(&field) - reinterpret_cast<char const*>(&band);
-    };
-    EXPECT_EQ((std::array{offset(band.r1), offset(band.r2), offset(band.items), offset(band.item_count),
-                  offset(band.item_capacity)}),
-        (std::array<std::ptrdiff_t, 5>{0, 4, 8, 16, 20}));
 }
 
 TEST(Region, ItemsOfABandAreInsertedRemovedAndAssigned)

@@ -22,8 +22,8 @@ at the device paths where programs look for them. No root, no device and no chan
                               keys, switch consoles, take screenshots, end the program; see below
   --bless                     write what the screen shows to the files that the script expects it to be like
   --print-steps               print the single steps that the script comes down to, and run nothing
-  --web[=PORT]                show the screen in web browsers and let them use mouse and keyboard, at port 6080
-                              if not given, at any free one if 0. The address is printed
+  --web[=PORT]                show the screen to web browsers, with mouse and keyboard, at port 6080 if not
+                              given, at any free one if 0. The address is printed
   --vnc[=PORT]                the same for VNC viewers; port 5900 if not given
   --listen ADDRESS            let other machines reach these ports, at this address. Needs a password
   --password-file FILE        ask viewers for the password in the first line of a file; 8 characters count

@@ -5,9 +5,9 @@
 namespace console {
 
 /// The way of a program's pointer to a place on the screen. A mouse tells only how far it was moved, so the
-/// way begins with pushes into the top left corner, where every pointer stops, and goes on in small reports,
-/// which no program takes for a fast movement, straight to the place. A pointer that should be at an edge is pushed against it, so
-/// that a belief that was wrong comes right again.
+/// way begins with pushes into the top left corner, where every pointer stops, and goes straight to the place
+/// in small reports, which no program takes for a fast movement. A pointer that should be at an edge is
+/// pushed against it, so that a belief that was wrong comes right again.
 class PointerPath {
 public:
     struct Motion {

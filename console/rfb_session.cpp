@@ -29,12 +29,6 @@ constexpr std::uint8_t kKeyCodesMessage = 255;
 constexpr std::size_t kKeyCodesLength = 11;  // behind the message's type
 constexpr std::chrono::milliseconds kWrongPasswordPause{500};
 
-/// All bytes at once or none: a socket's buffer is larger than what is written.
-bool WriteAll(int fd, void const* bytes, std::size_t length)
-{
-    return send(fd, bytes, length, MSG_NOSIGNAL | MSG_DONTWAIT) == static_cast<ssize_t>(length);
-}
-
 std::uint32_t ReadBig(unsigned char const* bytes, unsigned count)
 {
     std::uint32_t number = 0;
@@ -90,10 +84,15 @@ struct RfbSession::Protocol {
     static rfbProtocolExtension& KeyCodes()
     {
         static int encodings[] = {kKeyCodesEncoding, 0};
-        static rfbProtocolExtension extension{};
-        extension.pseudoEncodings = encodings;
-        extension.enablePseudoEncoding = OnEncoding;
-        extension.handleMessage = OnMessage;
+        static rfbProtocolExtension extension = {.newClient = nullptr,
+            .init = nullptr,
+            .pseudoEncodings = encodings,
+            .enablePseudoEncoding = OnEncoding,
+            .handleMessage = OnMessage,
+            .close = nullptr,
+            .usage = nullptr,
+            .processArgument = nullptr,
+            .next = nullptr};
         return extension;
     }
 
@@ -129,7 +128,7 @@ struct RfbSession::Protocol {
     }
 };
 
-void RfbSession::ScreenDeleter::operator()(_rfbScreenInfo* screen) const { rfbScreenCleanup(screen); }
+void RfbSession::ScreenDeleter::operator()(_rfbScreenInfo* old) const { rfbScreenCleanup(old); }
 
 RfbSession::RfbSession(ViewerShare const& shared, int socket, RfbGreeting greeting)
     : share(shared), screen(Protocol::MakeScreen())
@@ -139,7 +138,10 @@ RfbSession::RfbSession(ViewerShare const& shared, int socket, RfbGreeting greeti
         passwords[0] = const_cast<char*>(share.password.c_str());
         screen->authPasswdData = passwords;
     }
-    share.watch.Read([this](Frame const& frame) { Resize(frame); });
+    share.watch.Read([this](Frame const& frame) {
+        frameNumber = frame.number;
+        Resize(frame);
+    });
     Connect(socket, greeting);
 }
 
@@ -148,9 +150,12 @@ RfbSession::~RfbSession()
     share.input.LetGo(hands);
     if (client == nullptr) return;
     if (IsOpen()) rfbCloseClient(client);
-    rfbDisableExtension(client, &Protocol::KeyCodes());
-    std::free(client->wsctx);  // the library forgets it
-    client->wsctx = nullptr;
+    // The library forgets these.
+    while (auto* const extension = client->extensions) {
+        client->extensions = extension->next;
+        std::free(extension);
+    }
+    std::free(std::exchange(client->wsctx, nullptr));
     rfbClientConnectionGone(client);
 }
 
@@ -164,7 +169,7 @@ void RfbSession::Connect(int socket, RfbGreeting greeting)
     if (greeting == RfbGreeting::Version) {
         Checked(socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, ends), "greeting a viewer");
         standIn = OwnedFd(ends[1], "greeting a viewer");
-        WriteAll(ends[1], kRfbVersion, kRfbVersionLength);
+        Checked(static_cast<int>(write(ends[1], kRfbVersion, kRfbVersionLength)), "greeting a viewer");
     } else {
         ends[0] = Checked(fcntl(socket, F_DUPFD_CLOEXEC, 0), "greeting a viewer");
     }
@@ -224,6 +229,7 @@ void RfbSession::UpdatePicture()
 /// Brings the picture up to date and marks what has changed, in blocks of rows.
 void RfbSession::TakeFrame(Frame const& frame)
 {
+    if (std::exchange(frameNumber, frame.number) == frame.number) return;
     auto const width = static_cast<std::size_t>(screen->width);
     if (frame.width != width || frame.height != static_cast<unsigned>(screen->height)) return Resize(frame);
     std::size_t left = width;

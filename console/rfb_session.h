@@ -9,8 +9,9 @@
 #include <string>
 #include <vector>
 
-struct _rfbClientRec;
-struct _rfbScreenInfo;
+// The library's names.
+struct _rfbClientRec;   // NOLINT(bugprone-reserved-identifier)
+struct _rfbScreenInfo;  // NOLINT(bugprone-reserved-identifier)
 
 namespace console {
 
@@ -35,7 +36,7 @@ inline constexpr std::size_t kRfbVersionLength = sizeof kRfbVersion - 1;
 /// it would serve many viewers with one screen, but then they wait for each other; here each has its own.
 class RfbSession {
 public:
-    /// The socket stays the caller's, doesn't block, and must be the screen's follower already.
+    /// The socket stays the caller's, who follows the screen already. It must not block.
     RfbSession(ViewerShare const& shared, int socket, RfbGreeting greeting);
     /// Lets go of what the viewer held.
     ~RfbSession();
@@ -56,7 +57,7 @@ public:
 private:
     struct Protocol;  // the library's callbacks
     struct ScreenDeleter {
-        void operator()(_rfbScreenInfo* screen) const;
+        void operator()(_rfbScreenInfo* old) const;
     };
 
     void Connect(int socket, RfbGreeting greeting);
@@ -68,7 +69,8 @@ private:
 
     ViewerShare const& share;
     std::vector<std::uint32_t> pixels;
-    char* passwords[2] = {};  // a list, as the library wants it
+    std::uint64_t frameNumber = 0;  // of the frame that they show
+    char* passwords[2] = {};        // a list, as the library wants it
     std::unique_ptr<_rfbScreenInfo, ScreenDeleter> screen;
     _rfbClientRec* client = nullptr;
     bool wantsKeyCodes = false;  // and hasn't been told that it gets them

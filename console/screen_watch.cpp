@@ -67,7 +67,9 @@ void ScreenWatch::Look()
     if (isOther) {
         mode = shown.mode;
         colours = shown.colours;
-        frame = {mode.width, mode.height, std::vector<std::uint32_t>(std::size_t{mode.width} * mode.height)};
+        frame.width = mode.width;
+        frame.height = mode.height;
+        frame.pixels.resize(std::size_t{mode.width} * mode.height);
         memory.assign(shown.bytes.size(), 0);
     }
     bool changed = isOther;
@@ -81,6 +83,7 @@ void ScreenWatch::Look()
         changed = true;
     }
     if (!changed) return;
+    ++frame.number;
     for (int const follower : followers)
         eventfd_write(follower, 1);
 }

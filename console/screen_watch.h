@@ -14,6 +14,7 @@ namespace console {
 struct Frame {
     unsigned width = 0;
     unsigned height = 0;
+    std::uint64_t number = 0;  ///< another one with each change
     std::vector<std::uint32_t> pixels;
 
     std::uint32_t* Row(unsigned y) { return pixels.data() + std::size_t{y} * width; }

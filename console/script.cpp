@@ -306,7 +306,7 @@ std::variant<Script, std::string> ReadScript(std::string const& path)
 
 std::string StepPrinter::Print(StepAction const& action)
 {
-    return std::visit([this](auto const& one) { return Text(one); }, action);
+    return std::visit([this](auto const& one) { return this->Text(one); }, action);
 }
 
 std::string StepPrinter::Text(MouseReport const& report)

@@ -14,7 +14,7 @@ class Viewer {
 public:
     /// The thread has the signal mask of the caller. `endedFd`, an event counter, is written to when the
     /// viewer has gone.
-    Viewer(ViewerShare const& shared, OwnedFd connection, RfbGreeting greeting, int endedFd);
+    Viewer(ViewerShare const& shared, OwnedFd connection, RfbGreeting greetedBy, int endedFd);
     /// Hangs up.
     ~Viewer();
     Viewer(Viewer const&) = delete;

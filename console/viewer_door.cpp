@@ -29,16 +29,16 @@ void SetOption(int socket, int level, int option, int value)
     setsockopt(socket, level, option, &value, sizeof value);
 }
 
-/// Takes what a guest has sent from its socket: closed with something unread, the answer would be lost.
-/// False if the guest has closed its side.
+/// True if the call that failed may succeed later.
+bool IsPassing(int error) { return error == EAGAIN || error == EWOULDBLOCK || error == EINTR; }
+
+/// Takes from a guest's socket what has come: closed with something unread, the answer would be lost. False
+/// if the guest has closed its side.
 bool Discard(int socket)
 {
-    std::array<char, 4096> unread{};
-    ssize_t length = 0;
-    do
-        length = recv(socket, unread.data(), unread.size(), MSG_DONTWAIT);
-    while (length > 0);
-    return length == -1 && (errno == EAGAIN || errno == EWOULDBLOCK);
+    std::array<char, 16384> unread{};
+    auto const length = recv(socket, unread.data(), unread.size(), MSG_DONTWAIT);
+    return length > 0 || (length == -1 && IsPassing(errno));
 }
 
 }
@@ -62,24 +62,36 @@ void ViewerDoor::Start()
 void ViewerDoor::Run()
 {
     while (!stopping) {
-        std::array<pollfd, 3> events = {pollfd{wakeFd.Get(), POLLIN, 0},
-            pollfd{ports.web ? ports.web->socket.Get() : -1, POLLIN, 0},
-            pollfd{ports.vnc ? ports.vnc->socket.Get() : -1, POLLIN, 0}};
-        poll(events.data(), events.size(), guests.empty() ? -1 : kAttendInterval);
-        eventfd_t ends = 0;
-        eventfd_read(wakeFd.Get(), &ends);
-        std::erase_if(viewers, [](auto const& viewer) { return viewer->HasEnded(); });
-        if (events[1].revents != 0) Admit(*ports.web, true);
-        if (events[2].revents != 0) Admit(*ports.vnc, false);
-        std::erase_if(guests, [this](Guest& guest) { return !Attend(guest); });
+        try {
+            Serve();
+        } catch (std::exception const&) {
+            // The system has no room for what somebody wanted; there are others.
+        }
     }
     viewers.clear();
+}
+
+void ViewerDoor::Serve()
+{
+    std::array<pollfd, 3> events = {pollfd{wakeFd.Get(), POLLIN, 0},
+        pollfd{ports.web ? ports.web->socket.Get() : -1, POLLIN, 0},
+        pollfd{ports.vnc ? ports.vnc->socket.Get() : -1, POLLIN, 0}};
+    poll(events.data(), events.size(), guests.empty() ? -1 : kAttendInterval);
+    eventfd_t ends = 0;
+    eventfd_read(wakeFd.Get(), &ends);
+    std::erase_if(viewers, [](auto const& viewer) { return viewer->HasEnded(); });
+    if (events[1].revents != 0) Admit(*ports.web, true);
+    if (events[2].revents != 0) Admit(*ports.vnc, false);
+    std::erase_if(guests, [this](Guest& guest) { return !Attend(guest); });
 }
 
 void ViewerDoor::Admit(Listener const& listener, bool fromWeb)
 {
     int const accepted = accept4(listener.socket.Get(), nullptr, nullptr, SOCK_CLOEXEC | SOCK_NONBLOCK);
-    if (accepted == -1) return;
+    if (accepted == -1) {
+        if (!IsPassing(errno)) poll(nullptr, 0, kAttendInterval);  // it would fail again at once
+        return;
+    }
     Guest guest{OwnedFd(accepted, "letting in a viewer"), fromWeb, Clock::now() + kPatience, {}};
     SetOption(accepted, IPPROTO_TCP, TCP_NODELAY, 1);
     SetOption(accepted, SOL_SOCKET, SO_KEEPALIVE, 1);
@@ -102,7 +114,7 @@ bool ViewerDoor::ReadRequest(Guest& guest)
 {
     std::array<char, kLongestHeader + 1> bytes{};
     auto const length = recv(guest.socket.Get(), bytes.data(), bytes.size(), MSG_PEEK | MSG_DONTWAIT);
-    if (length == -1) return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
+    if (length == -1) return IsPassing(errno);
     if (length == 0) return false;
     auto const wish =
         ReadHttpRequest({bytes.data(), static_cast<std::size_t>(length)}, share.password.empty());
@@ -138,7 +150,7 @@ bool ViewerDoor::ReadVersion(Guest& guest)
 {
     std::array<char, kRfbVersionLength> bytes{};
     auto const length = recv(guest.socket.Get(), bytes.data(), bytes.size(), MSG_PEEK | MSG_DONTWAIT);
-    if (length == -1) return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
+    if (length == -1) return IsPassing(errno);
     constexpr std::string_view start = "RFB 003.";
     auto const known = std::min(static_cast<std::size_t>(length), start.size());
     if (length == 0 || std::string_view(bytes.data(), known) != start.substr(0, known)) return false;
@@ -160,18 +172,14 @@ bool ViewerDoor::HasRoom()
 
 void ViewerDoor::LetIn(Guest& guest, RfbGreeting greeting)
 {
-    try {
-        viewers.push_back(std::make_unique<Viewer>(share, std::move(guest.socket), greeting, wakeFd.Get()));
-    } catch (std::exception const&) {
-        // The system has no room for one more; it is hung up on.
-    }
+    viewers.push_back(std::make_unique<Viewer>(share, std::move(guest.socket), greeting, wakeFd.Get()));
 }
 
 bool ViewerDoor::Send(Guest& guest)
 {
     int const socket = guest.socket.Get();
     auto const sent = send(socket, guest.answer.data(), guest.answer.size(), MSG_NOSIGNAL | MSG_DONTWAIT);
-    if (sent == -1) return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
+    if (sent == -1) return IsPassing(errno);
     guest.answer.erase(0, static_cast<std::size_t>(sent));
     if (!guest.answer.empty()) return true;
     shutdown(socket, SHUT_WR);

@@ -44,6 +44,7 @@ private:
     };
 
     void Run();
+    void Serve();
     void Admit(Listener const& listener, bool fromWeb);
     // Each gives false for a guest that is to be shown out, or has become a viewer.
     bool Attend(Guest& guest);

@@ -8,11 +8,13 @@ namespace {
 
 using std::chrono::milliseconds;
 
-constexpr std::size_t kMostEvents = 1000;        // that wait for the program
-constexpr milliseconds kReadLimit{100};          // what is not read for so long doesn't hold up others
-constexpr milliseconds kOpenLimit{1000};         // the same for a mouse that the program gets ready
+constexpr std::size_t kMostEvents = 1000;  // that wait for the program
+constexpr milliseconds kReadLimit{100};    // what is not read for so long doesn't hold up others
+constexpr milliseconds kOpenLimit{1000};   // the same for a mouse that the program gets ready
+// Programs read the two devices side by side. A key behind a click is to come when that has had its effect.
+constexpr milliseconds kChangePause{30};
 constexpr std::chrono::microseconds kPoll{250};  // from one look at whether the program has read to the next
-constexpr milliseconds kIdlePoll{20};
+constexpr std::chrono::microseconds kIdlePoll{20000};
 // The program is through with what it has to say to the mouse if it says no more for so long. If it hasn't
 // turned on the wheel yet, that is probably still to come.
 constexpr milliseconds kHandshakePause{50};
@@ -62,7 +64,7 @@ void ViewerInput::Key(Hands& hands, unsigned char code, bool down)
     }
 }
 
-void ViewerInput::Point(Hands& hands, int x, int y, unsigned now)
+void ViewerInput::Point(Hands& hands, int x, int y, unsigned down)
 {
     std::lock_guard const lock(mutex);
     if (!events.empty() && std::holds_alternative<Place>(events.back()))
@@ -71,12 +73,12 @@ void ViewerInput::Point(Hands& hands, int x, int y, unsigned now)
         Add(Place{x, y});
     for (unsigned bit = 0; bit < buttonHolders.size(); ++bit) {
         unsigned const mask = 1U << bit;
-        bool const down = (now & mask) != 0;
-        if (down == ((hands.buttons & mask) != 0) || (down && IsFull())) continue;
+        bool const isDown = (down & mask) != 0;
+        if (isDown == ((hands.buttons & mask) != 0) || (isDown && IsFull())) continue;
         hands.buttons ^= mask;
         auto& holders = buttonHolders[bit];
-        holders += down ? 1 : -1U;
-        if (holders == (down ? 1U : 0U)) Add(Button{mask, down});
+        bool const counts = isDown ? holders++ == 0 : --holders == 0;
+        if (counts) Add(Button{mask, isDown});
     }
 }
 
@@ -108,6 +110,7 @@ bool ViewerInput::IsFull() const { return events.size() >= kMostEvents; }
 void ViewerInput::Add(Event const& event)
 {
     events.push_back(event);
+    hasNews = true;
     wake.notify_all();
 }
 
@@ -117,14 +120,12 @@ void ViewerInput::Run(std::stop_token const& stop)
     while (!stop.stop_requested()) {
         bool const busy = Step();
         if (!busy && recording != nullptr) recording->OnIdle();
-        if (busy)
-            wake.wait_for(lock, stop, kPoll, [] { return false; });
-        else
-            wake.wait_for(lock, stop, kIdlePoll, [this] { return !events.empty(); });
+        hasNews = false;
+        wake.wait_for(lock, stop, busy ? kPoll : kIdlePoll, [&] { return hasNews && !busy; });
     }
 }
 
-/// Brings a part of the first event that can be brought. False if none waits.
+/// Brings a part of the first event that can be brought. False if there is none.
 bool ViewerInput::Step()
 {
     NoticeConsole();
@@ -141,9 +142,9 @@ bool ViewerInput::Step()
         if (state == Device::Stuck) continue;
         if (state == Device::Free && std::visit([this](auto const& one) { return Do(one); }, *event))
             events.erase(event);
-        break;
+        return true;
     }
-    return !events.empty();
+    return false;
 }
 
 void ViewerInput::NoticeConsole()
@@ -198,7 +199,10 @@ ViewerInput::Device ViewerInput::KeyboardState()
 ViewerInput::Device ViewerInput::StateFor(Event const& event, Device keyboard, Device mouse) const
 {
     if (IsAway() || std::holds_alternative<ConsoleSwitch>(event)) return Device::Free;
-    return std::holds_alternative<KeyByte>(event) ? keyboard : mouse;
+    bool const isKey = std::holds_alternative<KeyByte>(event);
+    auto const state = isKey ? keyboard : mouse;
+    bool const tooSoon = Clock::now() - (isKey ? mouseReported : keySent) < kChangePause;
+    return state == Device::Free && tooSoon ? Device::Busy : state;
 }
 
 bool ViewerInput::Do(KeyByte key)

@@ -43,8 +43,8 @@ public:
 
     /// A key goes down or up, or repeats.
     void Key(Hands& hands, unsigned char code, bool down);
-    /// The pointer goes to a pixel; there, buttons change.
-    void Point(Hands& hands, int x, int y, unsigned buttons);
+    /// The pointer goes to a pixel; there, buttons change to those that are down.
+    void Point(Hands& hands, int x, int y, unsigned down);
     /// By one notch, 1 away from the user and -1 towards them.
     void TurnWheel(int notch);
     void SwitchTo(unsigned toConsole);
@@ -92,6 +92,7 @@ private:
     std::mutex mutex;
     std::condition_variable_any wake;
     std::deque<Event> events;
+    bool hasNews = false;                    ///< since the thread has looked at the events
     std::array<unsigned, 128> keyHolders{};  ///< how many viewers hold each key
     std::array<unsigned, 3> buttonHolders{};
 

@@ -15,7 +15,7 @@ class ViewerServer {
 public:
     /// Opens the ports; nobody is let in yet. `page` is the file that browsers get. Throws `std::exception`
     /// with what is wrong if an address cannot be listened at or the password cannot be read.
-    ViewerServer(VirtualConsole& console, ViewerOptions const& options, std::string page);
+    ViewerServer(VirtualConsole& console, ViewerOptions const& wanted, std::string page);
     /// Hangs up on all viewers. What they held is not let go of: nobody is there any more.
     ~ViewerServer() { input.Stop(); }
     ViewerServer(ViewerServer const&) = delete;

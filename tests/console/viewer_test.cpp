@@ -1,4 +1,5 @@
 #include <console/picture.h>
+#include <console/viewer_server.h>
 
 #include <gtest/gtest.h>
 
@@ -48,7 +49,7 @@ public:
     {
         std::filesystem::create_directories(folder);
         auto const command =
-            "cd " + folder + "; exec " CONSOLE_TOOL " --web=0 --vnc=0 " + words + " >out 2>err";
+            "cd " + folder + "; exec " CONSOLE_TOOL " --web=0 --vnc=0 --mode " + words + " >out 2>err";
         tool = fork();
         if (tool == 0) _exit(execl("/bin/sh", "sh", "-c", command.c_str(), nullptr));
         EXPECT_TRUE(Await([&] { return Contents(folder + "err").find("VNC") != std::string::npos; }))
@@ -94,12 +95,13 @@ private:
 /// Somebody with a VNC viewer.
 class User {
 public:
-    explicit User(Shown const& shown, char const* password = "") : secret(password)
+    explicit User(int port, char const* password = "") : secret(password)
     {
         rfbEnableClientLogging = FALSE;
         client = rfbGetClient(8, 3, 4);
+        std::free(client->serverHost);
         client->serverHost = strdup("127.0.0.1");
-        client->serverPort = shown.vnc;
+        client->serverPort = port;
         client->GetPassword = [](rfbClient* one) {
             return strdup(static_cast<User*>(rfbClientGetClientData(one, nullptr))->secret);
         };
@@ -173,12 +175,12 @@ private:
 
 TEST(Viewers, SeeTheVeryPixels)
 {
+    auto const script = testing::TempDir() + "viewer-script" + std::to_string(getpid());
+    std::ofstream(script) << "settle 300\nscreenshot shown.png\n";
     // Lossless, though this viewer would take lossy pictures.
-    for (std::string const mode : {"640x480x4", "803x601x8", "640x480x16", "642x480x24"}) {
-        auto const script = testing::TempDir() + "viewer-script" + std::to_string(getpid());
-        std::ofstream(script) << "settle 300\nscreenshot shown.png\n";
-        Shown shown("--mode " + mode + " --script " + script + " -- " DESKTOP);
-        User first(shown), second(shown);
+    for (char const* const mode : {"640x480x4", "803x601x8", "640x480x16", "642x480x24"}) {
+        Shown shown(std::string(mode).append(" --script ").append(script).append(" -- " DESKTOP));
+        User first(shown.vnc), second(shown.vnc);
         ASSERT_TRUE(first.IsIn() && second.IsIn());
         auto const path = shown.folder + "shown.png";
         Picture picture;
@@ -188,14 +190,33 @@ TEST(Viewers, SeeTheVeryPixels)
             return !picture.bytes.empty();
         }));
         EXPECT_TRUE(first.Sees(picture) && second.Sees(picture)) << mode;
-        unlink(script.c_str());
     }
+    unlink(script.c_str());
+}
+
+TEST(Viewers, FollowAChangeOfMode)
+{
+    console::VirtualConsole console({.mode = *console::ParseMode("64x48x8"), .format = {}, .faults = {}});
+    console::ViewerOptions options;
+    options.vncPort = 0;
+    console::ViewerServer server(console, options, "");
+    testing::internal::CaptureStderr();
+    server.Start();
+    auto const said = testing::internal::GetCapturedStderr();
+    User user(std::stoi(said.substr(said.rfind(':') + 1)));
+    ASSERT_TRUE(user.IsIn() && user.Sees(console.Screen()));
+    for (char const* const mode : {"99x101x16", "33x48x32"}) {
+        console.ChangeMode(*console::ParseMode(mode));
+        EXPECT_TRUE(user.Sees(console.Screen())) << mode;
+    }
+    console.SwitchTo(2);  // shows a colour
+    EXPECT_TRUE(user.Sees(console.Screen()) && console.Screen().At(0, 0) != 0);
 }
 
 TEST(Viewers, UseMouseAndKeyboard)
 {
-    Shown shown("--mode 64x480x8 -- " INPUT_PROBE);
-    User user(shown), other(shown);
+    Shown shown("64x480x8 -- " INPUT_PROBE);
+    User user(shown.vnc), other(shown.vnc);
     ASSERT_TRUE(user.IsIn() && other.IsIn() && shown.Prints("answers"));
     user.Point(12, 3, 1);
     user.Point(12, 3, 0);
@@ -228,7 +249,7 @@ TEST(Viewers, UseMouseAndKeyboard)
             "key 1e\nkey 67\nkey e7\nkey 1e\nkey 9e\nreleased\nacquired\nkey bb\nkey b8\nkey 9d\n");
     // Two hold the same, and one goes away: it is held until the other one lets go.
     {
-        User third(shown);
+        User third(shown.vnc);
         for (User* const one : {&third, &other}) {
             one->Point(0, 0, 1);
             one->Key(0x2C, true);
@@ -246,8 +267,8 @@ TEST(Viewers, UseMouseAndKeyboard)
 
 TEST(Viewers, RecordingShowsTheSameAgain)
 {
-    Shown shown("--mode 640x480x16 --record a.script --screenshot live.png -- " DESKTOP);
-    User user(shown);
+    Shown shown("640x480x16 --record a.script --screenshot live.png -- " DESKTOP);
+    User user(shown.vnc);
     ASSERT_TRUE(user.IsIn());
     user.Point(180, 50);
     user.Point(180, 50, 1);
@@ -274,7 +295,7 @@ TEST(Viewers, RecordingShowsTheSameAgain)
 
 TEST(Viewers, NobodyHoldsUpOrHarmsTheOthers)
 {
-    Shown shown("--mode 64x480x8 -- " INPUT_PROBE);
+    Shown shown("64x480x8 -- " INPUT_PROBE);
     std::mt19937 random(5);
     std::vector<std::unique_ptr<Stranger>> silent;
     std::string const upgrade =
@@ -306,19 +327,20 @@ TEST(Viewers, NobodyHoldsUpOrHarmsTheOthers)
     other.Say(upgrade);
     EXPECT_EQ(other.Hear(), "RFB 003.008\n");
     EXPECT_EQ(other.Hear(), "");
-    User user(shown);
+    User user(shown.vnc);
     ASSERT_TRUE(user.IsIn());
     user.Key(0x15, true);
     EXPECT_TRUE(shown.Prints("key 15\n"));
+    shown.End();  // with all of them still there
 }
 
 TEST(Viewers, PasswordIsAskedForAndRequiredBeyondThisMachine)
 {
     auto const file = testing::TempDir() + "viewer-password" + std::to_string(getpid());
     std::ofstream(file) << "secret\nnot this\n";
-    Shown shown("--listen 0.0.0.0 --password-file " + file + " -- " INPUT_PROBE);
-    EXPECT_FALSE(User(shown, "wrong").IsIn());
-    EXPECT_TRUE(User(shown, "secret").IsIn());
+    Shown shown("64x480x8 --listen 0.0.0.0 --password-file " + file + " -- " INPUT_PROBE);
+    EXPECT_FALSE(User(shown.vnc, "wrong").IsIn());
+    EXPECT_TRUE(User(shown.vnc, "secret").IsIn());
     auto const fails = [&](std::string const& words, std::string const& what) {
         auto const err = shown.folder + "refused";
         EXPECT_EQ(WEXITSTATUS(std::system((CONSOLE_TOOL " " + words + " -- true 2>" + err).c_str())), 2)

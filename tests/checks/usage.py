@@ -10,7 +10,7 @@ from tree import ROOT, finish
 build, version = pathlib.Path(sys.argv[1]), sys.argv[2]
 tools = [path for folder in ("care", "console", "tools") for path in (build / folder).iterdir()
          if path.is_file() and not path.suffix and os.access(path, os.X_OK)]
-scripts = [ROOT / "scripts" / name for name in ("bench", "build", "fetch-kernel", "test")]
+scripts = [ROOT / "scripts" / name for name in ("bench", "build", "demo", "fetch-kernel", "setup", "test")]
 complaints = []
 
 

@@ -43,8 +43,7 @@ at the device paths where programs look for them. No root, no device and no chan
 A script has one command a line; what follows a word that begins with # is a comment. Times are milliseconds.
 
   move DX DY...               move the mouse, right and downward, by -127 to 127 counts, once for each pair
-  press BUTTON                press or release left, right or middle
-  release BUTTON
+  press|release BUTTON        press or release left, right or middle
   click [BUTTON]              both, left if no button is given
   wheel up|down [NOTCHES]     turn the wheel, one notch if no number is given
   type KEY...                 press and release keys: type a shift-b ctrl-alt-f2 ret. They have QEMU's names

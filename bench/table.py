@@ -89,7 +89,7 @@ def parse_arguments():
     parser.add_argument("--filter", type=pattern, default="", metavar="REGEX",
                         help="only rows that match")
     parser.add_argument("--repetitions", type=int, default=9, metavar="N",
-                        help="medians are of so many (9)")
+                        help="medians are of so many rounds (9)")
     arguments = parser.parse_args()
     if arguments.repetitions < 1:
         parser.error("--repetitions must be at least 1")
@@ -125,40 +125,45 @@ def names_in(program):
 
 
 def measure(program, names, assertions, arguments):
-    """Google Benchmark's report on the named measurements, made in random order."""
+    """Google Benchmark's reports on the named measurements, one of each of several rounds. Machines have slow and fast
+    moments; a row's contenders come one right after the other, so that a round sees them alike."""
     environment = {name: value for name, value in os.environ.items()
                    if not name.startswith("VELLUM_SAFE_ASSERT")}
     if assertions == "off":
         environment["VELLUM_SAFE_ASSERT"] = "none"
-    report = arguments.results / f"{program.name}-{assertions}.json"
     alternatives = "|".join(re.sub(r"[.+]", r"\\\g<0>", name) for name in names)
-    subprocess.run([program, f"--benchmark_filter=^({alternatives})$",
-                    f"--benchmark_repetitions={arguments.repetitions}", "--benchmark_min_time=0.02",
-                    "--benchmark_enable_random_interleaving=true",
-                    f"--benchmark_out={report}", "--benchmark_out_format=json"],
-                   env=environment, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=True)
-    return json.loads(report.read_text(encoding="utf-8"))
+    reports = []
+    for number in range(1, arguments.repetitions + 1):
+        report = arguments.results / f"{program.name}-{assertions}-{number}.json"
+        subprocess.run([program, f"--benchmark_filter=^({alternatives})$", "--benchmark_min_time=0.02",
+                        f"--benchmark_out={report}", "--benchmark_out_format=json"],
+                       env=environment, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=True)
+        reports.append(json.loads(report.read_text(encoding="utf-8")))
+    return reports
 
 
-def rows_from(report, names, assertions):
-    """The table's rows: medians in nanoseconds of processor time, which other programs disturb least."""
+def rows_from(reports, names, assertions):
+    """The table's rows: medians over the rounds, of nanoseconds of processor time, which other programs disturb least,
+    and of the ratios that each round has."""
     times = {}
-    for run in report["benchmarks"]:
-        if run["run_type"] == "iteration":
-            times.setdefault(run["run_name"], []).append(run["cpu_time"])
+    for report in reports:
+        for run in report["benchmarks"]:
+            times.setdefault(run["name"], []).append(run["cpu_time"])
     rows = []
     for row in dict.fromkeys(map(row_of, names)):
-        medians = {contender_of(name): statistics.median(times[name])
-                   for name in names if row_of(name) == row}
-        ours = medians.pop(OURS)
-        best = min(medians, key=medians.get)
-        ratio = medians[best] / ours
+        measured = {contender_of(name): times[name] for name in names if row_of(name) == row}
+        ours = measured.pop(OURS)
+        ratios = {peer: statistics.median(theirs / our for theirs, our in zip(measured[peer], ours))
+                  for peer in measured}
+        best = min(ratios, key=ratios.get)
+        ratio = ratios[best]
         _, least, aim = next((goal for goal in GOALS if goal[0].match(row)), (None, None, None))
         if REPORTING.match(row) and assertions == "on":
             least = aim = None  # the price of the reports, not of the work
         reach = "" if least is None else "short" if ratio < least else "ok" if ratio < aim else "aim"
-        rows.append({"row": row, "assertions": assertions, "ours": ours, "peers": medians, "best_peer": best,
-                     "ratio": ratio, "least": least, "aim": aim, "reach": reach})
+        rows.append({"row": row, "assertions": assertions, "ours": statistics.median(ours),
+                     "peers": {peer: statistics.median(theirs) for peer, theirs in measured.items()},
+                     "best_peer": best, "ratio": ratio, "least": least, "aim": aim, "reach": reach})
     return rows
 
 
@@ -174,7 +179,7 @@ def growth_of(rows):
 
 def print_table(here, rows, growth, repetitions):
     print(f"{here['processor']}, {here['processors']} processors; {' '.join(here['vector_features'])}")
-    print(f"load {here['load'][0]:.1f} before; medians of {repetitions}; ratio: the peer's time by ours\n")
+    print(f"load {here['load'][0]:.1f} before; medians of {repetitions} rounds; ratio: the peer's time by ours\n")
     width = max(len(row["row"]) for row in rows)
     print(f"{'row':{width}}  asserts      ours/ns      peer/ns  best peer  ratio  least   aim")
     for row in rows:

@@ -18,12 +18,11 @@ constexpr milliseconds kShortestPause{20};
 constexpr milliseconds kLongestPause{3600000};  // that a script may have
 constexpr std::size_t kLongestLine = 100;
 constexpr std::string_view kMove = "move";
-constexpr unsigned char kReleased = 0x80;
 
 bool IsRelease(StepAction const& action, std::string const& line)
 {
     auto const* const key = std::get_if<KeyByte>(&action);
-    return key != nullptr ? (key->code & kReleased) != 0 : line.starts_with("release");
+    return key != nullptr ? (key->code & KeyByte::kReleased) != 0 : line.starts_with("release");
 }
 
 }

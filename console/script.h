@@ -20,8 +20,9 @@ struct MouseReport {
     unsigned buttons = 0;
 };
 
-/// A key's code, with bit 7 set at its release.
+/// A key's code, with `kReleased` set at its release.
 struct KeyByte {
+    static constexpr unsigned char kReleased = 0x80;
     unsigned char code = 0;
 };
 

@@ -1,5 +1,7 @@
 #include <console/script_keys.h>
 
+#include <console/script.h>
+
 #include <algorithm>
 #include <array>
 
@@ -25,8 +27,6 @@ constexpr std::array<std::string_view, 128> kKeyNames = {
 };
 static_assert(kKeyNames[55] == "kp_multiply" && kKeyNames[96] == "kp_enter" && kKeyNames[127] == "compose");
 
-constexpr unsigned char kReleased = 0x80;
-
 std::optional<unsigned char> CodeOf(std::string_view name)
 {
     auto const found = std::find(kKeyNames.begin(), kKeyNames.end(), name);
@@ -46,7 +46,7 @@ std::optional<std::vector<unsigned char>> BytesOfChord(std::string_view chord)
         bytes.push_back(*code);
     }
     for (std::size_t i = bytes.size(); i-- > 0;)
-        bytes.push_back(bytes[i] | kReleased);
+        bytes.push_back(bytes[i] | KeyByte::kReleased);
     return bytes;
 }
 

@@ -1,5 +1,7 @@
 #include <console/script_player.h>
 
+#include <console/mouse_handshake.h>
+
 #include <csignal>
 #include <exception>
 #include <filesystem>
@@ -16,10 +18,6 @@ using std::chrono::milliseconds;
 
 constexpr milliseconds kReadyLimit{10000};  // for the program to get ready for a step
 constexpr milliseconds kReadLimit{100};     // to read a report; what takes longer is left in the device
-// The program is through with what it has to say to the mouse if it says no more for so long. If it hasn't
-// turned on the wheel yet, that is probably still to come.
-constexpr milliseconds kHandshakePause{50};
-constexpr milliseconds kPlainPause{500};
 constexpr milliseconds kPollInterval{2};
 constexpr milliseconds kPictureInterval{20};
 constexpr milliseconds kKillDelay{5000};  // to end when asked to
@@ -101,13 +99,9 @@ ScriptPlayer::Problem ScriptPlayer::PlaySteps()
 ScriptPlayer::Problem ScriptPlayer::Do(MouseReport const& report)
 {
     if (!mouseReady) {
-        auto spokenTo = Clock::now();
-        auto const isQuiet = [&] {
-            if (!console.IsMouseRead()) spokenTo = Clock::now();
-            bool const plain = console.Mouse().protocol == MouseProtocol::Plain;
-            return Clock::now() - spokenTo >= (plain ? kPlainPause : kHandshakePause);
-        };
-        if (auto what = Need(isQuiet, "opened the mouse and read its answers"); !what.empty()) return what;
+        MouseHandshake handshake;
+        auto const isOver = [&] { return handshake.IsOver(console); };
+        if (auto what = Need(isOver, "opened the mouse and read its answers"); !what.empty()) return what;
         mouseReady = true;
     }
     if (!console.MoveMouse(report.dx, report.dy, report.wheel, report.buttons))

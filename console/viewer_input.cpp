@@ -15,12 +15,7 @@ constexpr milliseconds kOpenLimit{1000};   // the same for a mouse that the prog
 constexpr milliseconds kChangePause{30};
 constexpr std::chrono::microseconds kPoll{250};  // from one look at whether the program has read to the next
 constexpr std::chrono::microseconds kIdlePoll{20000};
-// The program is through with what it has to say to the mouse if it says no more for so long. If it hasn't
-// turned on the wheel yet, that is probably still to come.
-constexpr milliseconds kHandshakePause{50};
-constexpr milliseconds kPlainPause{500};
 
-constexpr unsigned char kReleased = 0x80;
 constexpr unsigned kLeftAlt = 56;
 
 /// The console whose key this is when alt is held; 0 for other keys.
@@ -60,7 +55,7 @@ void ViewerInput::Key(Hands& hands, unsigned char code, bool down)
         Add(KeyByte{code});
     } else if (hands.keys.test(code)) {
         hands.keys.reset(code);
-        if (--keyHolders.at(code) == 0) Add(KeyByte{static_cast<unsigned char>(code | kReleased)});
+        if (--keyHolders.at(code) == 0) Add(KeyByte{static_cast<unsigned char>(code | KeyByte::kReleased)});
     }
 }
 
@@ -167,17 +162,14 @@ void ViewerInput::NoticeReading(Device keyboard, Device mouse)
 /// True if the program has opened the mouse and said to it what it has to say.
 bool ViewerInput::IsMouseOpen()
 {
-    auto const now = Clock::now();
     if (unsigned const opens = console.Count(Request::OpenMouse); opens != mouseOpens) {
         mouseOpens = opens;
         mouseReady = false;
-        mouseOpened = mouseSpokenTo = now;
+        mouseOpened = Clock::now();
+        handshake = {};
         path.Forget();
     }
-    if (mouseReady) return true;
-    if (!console.IsMouseRead()) mouseSpokenTo = now;
-    bool const plain = console.Mouse().protocol == MouseProtocol::Plain;
-    mouseReady = now - mouseSpokenTo >= (plain ? kPlainPause : kHandshakePause);
+    mouseReady = mouseReady || handshake.IsOver(console);
     return mouseReady;
 }
 
@@ -207,8 +199,8 @@ ViewerInput::Device ViewerInput::StateFor(Event const& event, Device keyboard, D
 
 bool ViewerInput::Do(KeyByte key)
 {
-    unsigned const code = key.code & ~kReleased;
-    bool const down = (key.code & kReleased) == 0;
+    unsigned const code = key.code & ~KeyByte::kReleased;
+    bool const down = (key.code & KeyByte::kReleased) == 0;
     keysDown.set(code, down);
     if (IsAway()) {
         unsigned const wished = down && keysDown.test(kLeftAlt) ? ConsoleOfKey(code) : 0;

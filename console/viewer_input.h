@@ -1,5 +1,6 @@
 #pragma once
 
+#include <console/mouse_handshake.h>
 #include <console/pointer_path.h>
 #include <console/recording.h>
 #include <console/script.h>
@@ -101,9 +102,10 @@ private:
     unsigned buttons = 0;        ///< that the program has been told of
     PointerPath path;
     int shownConsole = TtyState::kOwnConsole;
+    MouseHandshake handshake;
     bool mouseReady = false;
     unsigned mouseOpens = 0;
-    Clock::time_point mouseOpened, mouseSpokenTo, mouseReported, keySent;
+    Clock::time_point mouseOpened, mouseReported, keySent;
     bool keyRecorded = false;     ///< and not known to be read
     bool reportRecorded = false;  ///< likewise
 

@@ -50,6 +50,3 @@ private:
 
 extern template class SmallBlocks<GrRange>;
 extern template class SmallBlocks<GrRegion::Band>;
-
-using RangeBlocks = SmallBlocks<GrRange>;
-using BandBlocks = SmallBlocks<GrRegion::Band>;

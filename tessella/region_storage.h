@@ -67,32 +67,28 @@ inline void ZeroSlots(GrRegion::Band* slots, std::ptrdiff_t count)
     }
 }
 
-inline GrRange* NewSlots(GrItemArray<GrRange> const&, int count)
+/// They hold anything.
+template <typename T>
+T* TakeSlots(int count)
 {
-    return count == kGrowth ? RangeBlocks::Take() : new GrRange[static_cast<std::size_t>(count)];
+    return count == kGrowth ? SmallBlocks<T>::Take() : new T[static_cast<std::size_t>(count)];
 }
+
+inline GrRange* NewSlots(GrItemArray<GrRange> const&, int count) { return TakeSlots<GrRange>(count); }
 
 inline GrRegion::Band* NewSlots(GrItemArray<GrRegion::Band> const&, int count)
 {
-    auto* const slots =
-        count == kGrowth ? BandBlocks::Take() : new GrRegion::Band[static_cast<std::size_t>(count)];
+    auto* const slots = TakeSlots<GrRegion::Band>(count);
     ZeroSlots(slots, count);
     return slots;
 }
 
 /// Only the slots themselves, of which there are at least `capacity`.
-inline void DeleteSlots(GrRange* slots, int capacity)
+template <typename T>
+void DeleteSlots(T* slots, int capacity)
 {
     if (capacity == kGrowth)
-        RangeBlocks::Give(slots);
-    else
-        delete[] slots;
-}
-
-inline void DeleteSlots(GrRegion::Band* slots, int capacity)
-{
-    if (capacity == kGrowth)
-        BandBlocks::Give(slots);
+        SmallBlocks<T>::Give(slots);
     else
         delete[] slots;
 }
